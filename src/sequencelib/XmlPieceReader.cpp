@@ -125,11 +125,12 @@ void XmlPieceReader::FailAt(std::size_t index, std::string cause) const {
 bool XmlPieceReader::ReadMore() {
     if (eof_)
         return false;
+    // Beyond a piece, only a markup item being read (or the text before the root) is held.
+    if (markupStart_ != npos && size_ - markupStart_ >= kMaxMarkupBytes) {
+        FailAt(markupStart_, "a tag, comment or other markup item is longer than " +
+                                 ByteCountText(kMaxMarkupBytes));
+    }
     if (size_ == capacity_) {
-        if (size_ - pos_ >= pieceBytes_ + kMaxMarkupBytes) {
-            FailAt(pos_, "a tag, comment or other markup item is longer than " +
-                             ByteCountText(kMaxMarkupBytes));
-        }
         const std::size_t grown = capacity_ * 2;
         std::unique_ptr<char[]> bigger(new char[grown]);
         std::memcpy(bigger.get(), buffer_.get(), size_);
@@ -168,6 +169,7 @@ void XmlPieceReader::Compact() {
     base_ += static_cast<int64_t>(pos_);
     size_ -= pos_;
     pos_ = 0;
+    markupStart_ = npos;
 }
 
 std::size_t XmlPieceReader::FindChar(std::size_t from, char c, std::size_t stop) {
@@ -208,6 +210,17 @@ bool XmlPieceReader::StartsWith(std::size_t at, const char* text, std::size_t le
 // --- Markup ----------------------------------------------------------------------------
 
 XmlPieceReader::Lexed XmlPieceReader::LexMarkup(std::size_t at) {
+    markupStart_ = at;
+    const Lexed lexed = LexItem(at);
+    markupStart_ = npos;
+    if (lexed.kind != Markup::Truncated && lexed.end - at > kMaxMarkupBytes) {
+        FailAt(at, "a tag, comment or other markup item is longer than " +
+                       ByteCountText(kMaxMarkupBytes));
+    }
+    return lexed;
+}
+
+XmlPieceReader::Lexed XmlPieceReader::LexItem(std::size_t at) {
     if (!Have(at + 1))
         return {};
     const char c = buffer_[at + 1];
@@ -316,6 +329,10 @@ void XmlPieceReader::ReadHead(XmlPieceHandler& handler) {
             ++i;
         if (!Have(i))
             FailAt(i, "the document has no root element");
+        if (i >= kMaxMarkupBytes) {
+            FailAt(i, "the text before the root element is longer than " +
+                          ByteCountText(kMaxMarkupBytes));
+        }
         if (buffer_[i] != '<')
             FailAt(i, "text before the root element");
         const Lexed m = LexMarkup(i);

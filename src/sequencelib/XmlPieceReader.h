@@ -95,6 +95,7 @@ class XmlPieceReader {
     void CheckEndTag(std::size_t tagStart, const Lexed& tag);
 
     Lexed LexMarkup(std::size_t at);
+    Lexed LexItem(std::size_t at);
     Lexed LexStartTag(std::size_t at);
     Lexed LexDoctype(std::size_t at);
     std::string NameAt(std::size_t at) const;
@@ -123,6 +124,7 @@ class XmlPieceReader {
     std::size_t size_ = 0;  // bytes held
     int64_t base_ = 0;      // text offset of buffer_[0]
     bool eof_ = false;
+    std::size_t markupStart_ = static_cast<std::size_t>(-1);  // the item being read
 
     // Lines: exact at base_, and a cursor that moves forward through the buffer.
     int64_t baseLine_ = 1;
