@@ -621,7 +621,7 @@ void Document::AppendSection(std::vector<std::string>& raws, const KeyPath& path
     const std::string newline = Newline();
     if (!raws.empty()) {
         if (!EndsWithNewline(raws.back())) raws.back() += newline;
-        if (!Trim(raws.back()).empty()) raws.push_back(newline);
+        if (!Trim(Content(raws.back())).empty()) raws.push_back(newline);
     }
     std::string section = "[" + std::string(kRootName);
     if (!path.empty()) section += "\\" + JoinPath(path);
@@ -774,7 +774,7 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
     std::vector<std::string> removalLine = raws;
     const std::string newline = Newline();
     if (!EndsWithNewline(removalLine.back())) removalLine.back() += newline;
-    if (!Trim(removalLine.back()).empty()) removalLine.push_back(newline);
+    if (!Trim(Content(removalLine.back())).empty()) removalLine.push_back(newline);
     removalLine.push_back("[-" + std::string(kRootName) + "\\" + JoinPath(keyPath) + "]" +
                           newline);
     return Commit({removed, withParent, removalLine}, expected);

@@ -237,7 +237,7 @@ bool WriteFully(int fd, const std::string& bytes) {
 std::optional<Stamp> StampOf(const std::string& path) {
     struct stat status;
     if (::stat(path.c_str(), &status) != 0) {
-        if (errno == ENOENT) return Stamp{};
+        if (errno == ENOENT || errno == ENOTDIR) return Stamp{};
         return std::nullopt;
     }
     return StampOfStat(status);
@@ -245,7 +245,9 @@ std::optional<Stamp> StampOf(const std::string& path) {
 
 ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
     const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-    if (fd < 0) return errno == ENOENT ? ReadOutcome::Missing : ReadOutcome::Failed;
+    if (fd < 0) {
+        return errno == ENOENT || errno == ENOTDIR ? ReadOutcome::Missing : ReadOutcome::Failed;
+    }
     struct stat status;
     bool ok = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
     if (ok) {
