@@ -4,7 +4,8 @@ namespace vtr::CheckUtils {
 
 std::string MakeCheckIdentifier(int32_t checkType, const std::string& parameter) {
     std::string identifier = std::to_string(checkType);
-    if (!parameter.empty()) identifier += "_" + parameter;
+    if (!parameter.empty())
+        identifier += "_" + parameter;
     return identifier;
 }
 

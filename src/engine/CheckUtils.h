@@ -13,13 +13,14 @@ std::string MakeCheckIdentifier(int32_t checkType, const std::string& parameter)
 
 // Holds a check's identifier: computed on the first request, returned as kept afterwards.
 class IdentifierOnce {
-public:
+  public:
     const std::string& Get(int32_t checkType, const std::string& parameter) {
-        if (!identifier_) identifier_ = MakeCheckIdentifier(checkType, parameter);
+        if (!identifier_)
+            identifier_ = MakeCheckIdentifier(checkType, parameter);
         return *identifier_;
     }
 
-private:
+  private:
     std::optional<std::string> identifier_;
 };
 

@@ -43,21 +43,26 @@ constexpr std::size_t kMaxDetails = 9;
 }  // namespace
 
 void AddNotificationClient(INotificationClient* client) {
-    if (client != nullptr) State().clients.push_back(client);
+    if (client != nullptr)
+        State().clients.push_back(client);
 }
 
 void RemoveNotificationClient(INotificationClient* client) {
     auto& clients = State().clients;
     auto found = std::find(clients.begin(), clients.end(), client);
-    if (found != clients.end()) clients.erase(found);
+    if (found != clients.end())
+        clients.erase(found);
 }
 
-void SetEventPump(std::function<void()> pump) { State().eventPump = std::move(pump); }
+void SetEventPump(std::function<void()> pump) {
+    State().eventPump = std::move(pump);
+}
 
 void ProcessPendingEvents() {
     // Copied so that a pump which replaces itself while running stays alive until it returns.
     std::function<void()> pump = State().eventPump;
-    if (pump) ResumeStep(pump);
+    if (pump)
+        ResumeStep(pump);
 }
 
 void PostTransientMessage(const std::string& message) {
@@ -74,7 +79,8 @@ ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpC
     // Empty details leave no gap: a result's details are always consecutive from the first.
     const std::size_t count = std::min(details.size(), kMaxDetails);
     for (std::size_t i = 0; i < count; ++i) {
-        if (!details[i].empty()) result->AddDetail(details[i]);
+        if (!details[i].empty())
+            result->AddDetail(details[i]);
     }
 
     VerificationState& state = State();
@@ -105,10 +111,18 @@ bool IsResultIgnored(const Result& result) {
     });
 }
 
-const std::vector<ResultPtr>& GetResults() { return State().results; }
-const std::vector<ResultPtr>& GetIgnoredResults() { return State().ignoredResults; }
-int32_t ErrorCount() { return static_cast<int32_t>(State().errors.size()); }
-int32_t WarningCount() { return static_cast<int32_t>(State().warnings.size()); }
+const std::vector<ResultPtr>& GetResults() {
+    return State().results;
+}
+const std::vector<ResultPtr>& GetIgnoredResults() {
+    return State().ignoredResults;
+}
+int32_t ErrorCount() {
+    return static_cast<int32_t>(State().errors.size());
+}
+int32_t WarningCount() {
+    return static_cast<int32_t>(State().warnings.size());
+}
 
 void ClearResults() {
     VerificationState& state = State();
@@ -118,7 +132,11 @@ void ClearResults() {
     state.warnings.clear();
 }
 
-OrderedStringSet& IgnoredMessageNumbers() { return State().ignoredMessageNumbers; }
-OrderedStringSet& IgnoredResultKeys() { return State().ignoredResultKeys; }
+OrderedStringSet& IgnoredMessageNumbers() {
+    return State().ignoredMessageNumbers;
+}
+OrderedStringSet& IgnoredResultKeys() {
+    return State().ignoredResultKeys;
+}
 
 }  // namespace vtr::LibVerify

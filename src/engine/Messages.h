@@ -22,8 +22,7 @@ namespace Messages {
 inline constexpr Message NoPlaybackFileName{0, 0, Severity::Error, "No Playback File Name"};
 inline constexpr Message NoErrorsOrWarnings{1, 1, Severity::Info, "No errors or warnings found"};
 inline constexpr Message VerificationCancelled{2, 2, Severity::Warning, "Verification cancelled"};
-inline constexpr Message NotFullyInstalled{3, 3, Severity::Error,
-                                           "Vantori is not fully installed"};
+inline constexpr Message NotFullyInstalled{3, 3, Severity::Error, "Vantori is not fully installed"};
 inline constexpr Message NoAppPathRegEntry{4, 4, Severity::Error,
                                            "No registry entry for application path"};
 inline constexpr Message AppDirectoryMissing{5, 5, Severity::Error,
@@ -45,8 +44,8 @@ inline constexpr Message NoMediaPathRegEntry{14, 14, Severity::Warning,
                                              "No registry entry for media data path"};
 inline constexpr Message MediaDirectoryMissing{15, 15, Severity::Warning,
                                                "Media data directory does not exist"};
-inline constexpr Message AppFileUnexpectedVersion{
-    16, 16, Severity::Error, "Application file has unexpected version number"};
+inline constexpr Message AppFileUnexpectedVersion{16, 16, Severity::Error,
+                                                  "Application file has unexpected version number"};
 inline constexpr Message WeeklyScheduleMissing{17, 17, Severity::Warning,
                                                "Weekly schedule file does not exist"};
 inline constexpr Message YearlyScheduleMissing{18, 18, Severity::Warning,
@@ -72,14 +71,13 @@ inline constexpr Message ChannelUndefinedNetwork{31, 31, Severity::Warning,
                                                  "Channel uses undefined comm network"};
 inline constexpr Message ChannelLengthConflict{32, 32, Severity::Warning,
                                                "Channel in tracks of conflicting length"};
-inline constexpr Message MusicalInNonAudioSection{
-    33, 33, Severity::Warning, "Musical file used in non-audio section of show"};
+inline constexpr Message MusicalInNonAudioSection{33, 33, Severity::Warning,
+                                                  "Musical file used in non-audio section of show"};
 inline constexpr Message ShellCommandMapMissing{41, 41, Severity::Warning,
                                                 "Shell command map file does not exist"};
 inline constexpr Message ShellCommandNotSet{42, 42, Severity::Warning, "Shell command not set"};
 inline constexpr Message ChannelConflict{43, 43, Severity::Warning, "Channel conflict"};
-inline constexpr Message OldKRPEnabled{44, 44, Severity::Warning,
-                                       "Old KR-P compatibility enabled"};
+inline constexpr Message OldKRPEnabled{44, 44, Severity::Warning, "Old KR-P compatibility enabled"};
 inline constexpr Message SequenceIntensityFileSettingsConflict{
     45, 47, Severity::Warning, "Channel settings conflict in sequence/intensity file"};
 inline constexpr Message IntensityFileSettingsConflict{

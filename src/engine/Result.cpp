@@ -16,17 +16,24 @@ std::string SeverityText(Severity severity) {
     return "Severity " + std::to_string(static_cast<int32_t>(severity));
 }
 
-void Result::AddDetail(const std::string& detail) { details_.push_back(detail); }
+void Result::AddDetail(const std::string& detail) {
+    details_.push_back(detail);
+}
 
-bool Result::Ignorable() const { return LibVerify::IsResultIgnored(*this); }
+bool Result::Ignorable() const {
+    return LibVerify::IsResultIgnored(*this);
+}
 
 std::string Result::IgnoreKey() const {
     // Stored keys carry the trailing " / " after the last detail; it is part of the key.
     std::string key = std::to_string(messageNumber_) + "-";
-    for (const std::string& detail : details_) key += detail + " / ";
+    for (const std::string& detail : details_)
+        key += detail + " / ";
     return key;
 }
 
-std::string Result::SeverityText() const { return vtr::SeverityText(severity_); }
+std::string Result::SeverityText() const {
+    return vtr::SeverityText(severity_);
+}
 
 }  // namespace vtr

@@ -6,7 +6,8 @@ namespace vtr {
 
 SavedErr::SavedErr() {
     std::exception_ptr current = std::current_exception();
-    if (!current) return;
+    if (!current)
+        return;
     try {
         std::rethrow_exception(current);
     } catch (const VtrError& error) {
@@ -24,7 +25,8 @@ SavedErr::SavedErr() {
 }
 
 void SavedErr::Raise() const {
-    if (other_) std::rethrow_exception(other_);
+    if (other_)
+        std::rethrow_exception(other_);
     throw VtrError(number_, source_, description_, helpFile_, helpContext_);
 }
 

@@ -18,7 +18,7 @@ namespace vtr {
 // number and source. An exception that is not a VtrError is kept as it is and rethrown
 // unchanged.
 class SavedErr {
-public:
+  public:
     SavedErr();
 
     const std::string& Description() const { return description_; }
@@ -30,7 +30,7 @@ public:
     // Raises the saved error again with exactly the saved values.
     [[noreturn]] void Raise() const;
 
-private:
+  private:
     std::string description_;
     int32_t helpContext_ = 0;
     std::string helpFile_;

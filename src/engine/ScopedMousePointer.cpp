@@ -24,14 +24,17 @@ void ScopedMousePointer::InstallHooks(GetHook get, SetHook set) {
 }
 
 ScopedMousePointer::~ScopedMousePointer() {
-    if (!remembered_) return;
+    if (!remembered_)
+        return;
     const Hooks& hooks = InstalledHooks();
-    if (hooks.set) ResumeStep([&] { hooks.set(*remembered_); });
+    if (hooks.set)
+        ResumeStep([&] { hooks.set(*remembered_); });
 }
 
 void ScopedMousePointer::SetPointer(int16_t pointer) {
     const Hooks& hooks = InstalledHooks();
-    if (!hooks.get || !hooks.set) return;
+    if (!hooks.get || !hooks.set)
+        return;
     if (!remembered_) {
         ResumeStep([&] { remembered_ = hooks.get(); });
     }

@@ -17,7 +17,7 @@ inline constexpr int16_t Hourglass = 11;
 // previous one back afterwards. The core knows no screen: the window installs the two hooks
 // that read and set the pointer. With none installed nothing happens; failures are ignored.
 class ScopedMousePointer {
-public:
+  public:
     using GetHook = std::function<int16_t()>;
     using SetHook = std::function<void(int16_t)>;
 
@@ -32,7 +32,7 @@ public:
     // Sets the pointer; the first call also remembers the one in force.
     void SetPointer(int16_t pointer);
 
-private:
+  private:
     std::optional<int16_t> remembered_;
 };
 

@@ -28,7 +28,8 @@ constexpr const char* kTempSource = "LibFile.MakeTempFileName";
 }  // namespace
 
 std::string AddTrailingBackslash(const std::string& path) {
-    if (path.empty() || path.back() == '\\' || path.back() == '/') return path;
+    if (path.empty() || path.back() == '\\' || path.back() == '/')
+        return path;
     return path + kSeparator;
 }
 
@@ -62,9 +63,8 @@ std::string MakeTempFileName(const std::string& prefix) {
     // exclusively so that no other process can have it.
     static unsigned counter = 0;
     for (int attempt = 0; attempt < 1000; ++attempt) {
-        const unsigned unique =
-            (GetCurrentProcessId() * 2654435761u) ^ static_cast<unsigned>(GetTickCount64()) ^
-            (++counter * 40503u);
+        const unsigned unique = (GetCurrentProcessId() * 2654435761u) ^
+                                static_cast<unsigned>(GetTickCount64()) ^ (++counter * 40503u);
         char number[16];
         wsprintfA(number, "%08X", unique);
         const std::string name = folder + prefix + number + ".tmp";

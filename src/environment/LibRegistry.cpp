@@ -9,7 +9,9 @@ namespace {
 
 using RegistryStore::Backend;
 
-Backend& Store() { return RegistryStore::Current(); }
+Backend& Store() {
+    return RegistryStore::Current();
+}
 
 [[noreturn]] void Fail(const char* operation, const char* description) {
     Raise(kRegistryErrorNumber, std::string("LibRegistry.") + operation, description);
@@ -39,7 +41,8 @@ KeyHandle OpenRegistryKey(RootKey root, const std::string& keyPath, uint32_t acc
         CreateRegistryKey(root, keyPath);
         status = Store().OpenKey(root, keyPath, kKeyWrite, key);
     }
-    if (status != 0) Fail("OpenRegistryKey", "RegOpenKeyEx failure");
+    if (status != 0)
+        Fail("OpenRegistryKey", "RegOpenKeyEx failure");
     return key;
 }
 
@@ -52,7 +55,8 @@ void CreateRegistryKey(RootKey root, const std::string& keyPath) {
 }
 
 void CloseRegistryKey(KeyHandle& handle) {
-    if (handle == 0) return;
+    if (handle == 0)
+        return;
     Store().CloseKey(handle);
     handle = 0;
 }
@@ -69,10 +73,9 @@ int32_t GetRegLong(RootKey root, const std::string& keyPath, const std::string& 
             type != RegistryStore::ValueType::Dword) {
             Fail("GetRegLong", "Error getting registry value");
         }
-        return static_cast<int32_t>(static_cast<uint32_t>(buffer[0]) |
-                                    static_cast<uint32_t>(buffer[1]) << 8 |
-                                    static_cast<uint32_t>(buffer[2]) << 16 |
-                                    static_cast<uint32_t>(buffer[3]) << 24);
+        return static_cast<int32_t>(
+            static_cast<uint32_t>(buffer[0]) | static_cast<uint32_t>(buffer[1]) << 8 |
+            static_cast<uint32_t>(buffer[2]) << 16 | static_cast<uint32_t>(buffer[3]) << 24);
     });
     CloseRegistryKey(key);
     return value;
@@ -92,7 +95,8 @@ std::string GetRegString(RootKey root, const std::string& keyPath, const std::st
         if (Store().QueryValue(key, valueName, nullptr, nullptr, &length) != 0) {
             Fail("GetRegString", "RegQueryValueEx failure (length)");
         }
-        if (length == 0) return std::string();
+        if (length == 0)
+            return std::string();
         std::string buffer(length, ' ');
         if (Store().QueryValue(key, valueName, nullptr, reinterpret_cast<uint8_t*>(buffer.data()),
                                &length) != 0) {

@@ -9,7 +9,8 @@ constexpr LibRegistry::RootKey kRoot = LibRegistry::kCurrentUser;
 
 std::string SuiteKeyPath(const std::string& subkey) {
     std::string path = "Software\\Vantori";
-    if (!subkey.empty()) path += "\\" + subkey;
+    if (!subkey.empty())
+        path += "\\" + subkey;
     return path;
 }
 

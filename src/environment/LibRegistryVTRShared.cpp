@@ -6,7 +6,8 @@ namespace vtr::LibRegistryVTRShared {
 
 std::string SharedKeyPath(const std::string& subkey) {
     std::string path = "Shared";
-    if (!subkey.empty()) path += "\\" + subkey;
+    if (!subkey.empty())
+        path += "\\" + subkey;
     return path;
 }
 

@@ -10,9 +10,11 @@ namespace vtr::LibSecurityTokens {
 
 bool SetTokenPrivilege(const std::string& privilegeName, bool enable) {
     HANDLE token = nullptr;
-    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES, &token)) return false;
+    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES, &token))
+        return false;
     LUID id;
-    if (!LookupPrivilegeValueA(nullptr, privilegeName.c_str(), &id)) return false;
+    if (!LookupPrivilegeValueA(nullptr, privilegeName.c_str(), &id))
+        return false;
     TOKEN_PRIVILEGES privileges;
     privileges.PrivilegeCount = 1;
     privileges.Privileges[0].Luid = id;
@@ -33,7 +35,9 @@ bool SetTokenPrivilege(const std::string& privilegeName, bool enable) {
 #else
 
 // Token privileges exist only on Windows; elsewhere there is nothing to adjust.
-bool SetTokenPrivilege(const std::string& /*privilegeName*/, bool /*enable*/) { return true; }
+bool SetTokenPrivilege(const std::string& /*privilegeName*/, bool /*enable*/) {
+    return true;
+}
 
 #endif
 

@@ -15,25 +15,34 @@ constexpr std::string_view kRootShort = "HKCU";
 
 // --- Text ----------------------------------------------------------------------------------
 
-bool IsBlank(char c) { return c == ' ' || c == '\t'; }
+bool IsBlank(char c) {
+    return c == ' ' || c == '\t';
+}
 
 std::string_view Trim(std::string_view s) {
-    while (!s.empty() && (IsBlank(s.front()) || s.front() == '\r')) s.remove_prefix(1);
-    while (!s.empty() && (IsBlank(s.back()) || s.back() == '\r')) s.remove_suffix(1);
+    while (!s.empty() && (IsBlank(s.front()) || s.front() == '\r'))
+        s.remove_prefix(1);
+    while (!s.empty() && (IsBlank(s.back()) || s.back() == '\r'))
+        s.remove_suffix(1);
     return s;
 }
 
 std::string_view TrimLeft(std::string_view s) {
-    while (!s.empty() && IsBlank(s.front())) s.remove_prefix(1);
+    while (!s.empty() && IsBlank(s.front()))
+        s.remove_prefix(1);
     return s;
 }
 
-char Upper(char c) { return (c >= 'a' && c <= 'z') ? static_cast<char>(c - 'a' + 'A') : c; }
+char Upper(char c) {
+    return (c >= 'a' && c <= 'z') ? static_cast<char>(c - 'a' + 'A') : c;
+}
 
 bool EqualsNoCase(std::string_view a, std::string_view b) {
-    if (a.size() != b.size()) return false;
+    if (a.size() != b.size())
+        return false;
     for (std::size_t i = 0; i < a.size(); ++i) {
-        if (Upper(a[i]) != Upper(b[i])) return false;
+        if (Upper(a[i]) != Upper(b[i]))
+            return false;
     }
     return true;
 }
@@ -44,24 +53,33 @@ bool StartsWithNoCase(std::string_view s, std::string_view prefix) {
 
 // The line without its line end.
 std::string_view Content(std::string_view raw) {
-    if (!raw.empty() && raw.back() == '\n') raw.remove_suffix(1);
-    if (!raw.empty() && raw.back() == '\r') raw.remove_suffix(1);
+    if (!raw.empty() && raw.back() == '\n')
+        raw.remove_suffix(1);
+    if (!raw.empty() && raw.back() == '\r')
+        raw.remove_suffix(1);
     return raw;
 }
 
-bool EndsWithNewline(const std::string& raw) { return !raw.empty() && raw.back() == '\n'; }
+bool EndsWithNewline(const std::string& raw) {
+    return !raw.empty() && raw.back() == '\n';
+}
 
 // The line end of a line as it stands ("" for a last line without one).
 std::string LineEnd(std::string_view raw) {
-    if (raw.size() >= 2 && raw.substr(raw.size() - 2) == "\r\n") return "\r\n";
-    if (!raw.empty() && raw.back() == '\n') return "\n";
+    if (raw.size() >= 2 && raw.substr(raw.size() - 2) == "\r\n")
+        return "\r\n";
+    if (!raw.empty() && raw.back() == '\n')
+        return "\n";
     return "";
 }
 
 int HexDigit(char c) {
-    if (c >= '0' && c <= '9') return c - '0';
-    if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F') return c - 'A' + 10;
+    if (c >= '0' && c <= '9')
+        return c - '0';
+    if (c >= 'a' && c <= 'f')
+        return c - 'a' + 10;
+    if (c >= 'A' && c <= 'F')
+        return c - 'A' + 10;
     return -1;
 }
 
@@ -133,10 +151,12 @@ std::optional<std::string> TextToUtf16Le(std::string_view text) {
         } else {
             return std::nullopt;
         }
-        if (i + length > text.size()) return std::nullopt;
+        if (i + length > text.size())
+            return std::nullopt;
         for (std::size_t k = 1; k < length; ++k) {
             const auto c = static_cast<unsigned char>(text[i + k]);
-            if ((c & 0xC0) != 0x80) return std::nullopt;
+            if ((c & 0xC0) != 0x80)
+                return std::nullopt;
             cp = (cp << 6) | (c & 0x3F);
         }
         if ((length == 3 && cp < 0x800) || (length == 4 && (cp < 0x10000 || cp > 0x10FFFF))) {
@@ -177,7 +197,8 @@ std::optional<std::string> ReadQuoted(std::string_view s, std::size_t& pos) {
 std::string Quote(std::string_view text) {
     std::string out = "\"";
     for (char c : text) {
-        if (c == '\\' || c == '"') out += '\\';
+        if (c == '\\' || c == '"')
+            out += '\\';
         out += c;
     }
     return out + "\"";
@@ -208,17 +229,24 @@ std::optional<std::string> ReadHexBytes(std::string_view list) {
     std::string bytes;
     std::size_t i = 0;
     while (true) {
-        while (i < list.size() && IsBlank(list[i])) ++i;
-        if (i == list.size()) break;
+        while (i < list.size() && IsBlank(list[i]))
+            ++i;
+        if (i == list.size())
+            break;
         const int high = HexDigit(list[i]);
-        if (high < 0) return std::nullopt;
+        if (high < 0)
+            return std::nullopt;
         int byte = high;
         ++i;
-        if (i < list.size() && HexDigit(list[i]) >= 0) byte = byte * 16 + HexDigit(list[i++]);
+        if (i < list.size() && HexDigit(list[i]) >= 0)
+            byte = byte * 16 + HexDigit(list[i++]);
         bytes += static_cast<char>(byte);
-        while (i < list.size() && IsBlank(list[i])) ++i;
-        if (i == list.size()) break;
-        if (list[i] != ',') return std::nullopt;
+        while (i < list.size() && IsBlank(list[i]))
+            ++i;
+        if (i == list.size())
+            break;
+        if (list[i] != ',')
+            return std::nullopt;
         ++i;
     }
     return bytes;
@@ -230,15 +258,18 @@ std::optional<Value> ReadValueData(std::string_view data, bool unicode) {
     if (!data.empty() && data.front() == '"') {
         std::size_t pos = 0;
         auto text = ReadQuoted(data, pos);
-        if (!text || !Trim(data.substr(pos)).empty()) return std::nullopt;
+        if (!text || !Trim(data.substr(pos)).empty())
+            return std::nullopt;
         return Value::String(*text);
     }
     if (StartsWithNoCase(data, "dword:")) {
         const std::string_view digits = data.substr(6);
-        if (digits.empty() || digits.size() > 8) return std::nullopt;
+        if (digits.empty() || digits.size() > 8)
+            return std::nullopt;
         uint32_t number = 0;
         for (char c : digits) {
-            if (HexDigit(c) < 0) return std::nullopt;
+            if (HexDigit(c) < 0)
+                return std::nullopt;
             number = number * 16 + static_cast<uint32_t>(HexDigit(c));
         }
         return Value::Dword(number);
@@ -250,10 +281,12 @@ std::optional<Value> ReadValueData(std::string_view data, bool unicode) {
         list = data.substr(4);
     } else if (StartsWithNoCase(data, "hex(")) {
         const std::size_t close = data.find("):");
-        if (close == std::string_view::npos || close == 4 || close > 12) return std::nullopt;
+        if (close == std::string_view::npos || close == 4 || close > 12)
+            return std::nullopt;
         type = 0;
         for (char c : data.substr(4, close - 4)) {
-            if (HexDigit(c) < 0) return std::nullopt;
+            if (HexDigit(c) < 0)
+                return std::nullopt;
             type = type * 16 + static_cast<uint32_t>(HexDigit(c));
         }
         list = data.substr(close + 2);
@@ -278,7 +311,8 @@ std::optional<Value> ReadValueData(std::string_view data, bool unicode) {
     value.type = type;
     value.opaque = true;
     for (char c : list) {
-        if (!IsBlank(c)) value.data += c;
+        if (!IsBlank(c))
+            value.data += c;
     }
     return value;
 }
@@ -308,25 +342,30 @@ std::string HexList(std::string_view bytes, std::string_view prefix, const std::
 std::string JoinPath(const KeyPath& path) {
     std::string out;
     for (const std::string& name : path) {
-        if (!out.empty()) out += '\\';
+        if (!out.empty())
+            out += '\\';
         out += name;
     }
     return out;
 }
 
 bool SamePath(const KeyPath& a, const KeyPath& b) {
-    if (a.size() != b.size()) return false;
+    if (a.size() != b.size())
+        return false;
     for (std::size_t i = 0; i < a.size(); ++i) {
-        if (!EqualsNoCase(a[i], b[i])) return false;
+        if (!EqualsNoCase(a[i], b[i]))
+            return false;
     }
     return true;
 }
 
 // True when prefix names the key path itself or one of its ancestors.
 bool IsWithin(const KeyPath& path, const KeyPath& prefix) {
-    if (prefix.size() > path.size()) return false;
+    if (prefix.size() > path.size())
+        return false;
     for (std::size_t i = 0; i < prefix.size(); ++i) {
-        if (!EqualsNoCase(path[i], prefix[i])) return false;
+        if (!EqualsNoCase(path[i], prefix[i]))
+            return false;
     }
     return true;
 }
@@ -337,7 +376,8 @@ Key& EnsureKey(Key& root, const KeyPath& path) {
     Key* key = &root;
     for (const std::string& name : path) {
         auto [it, added] = key->subkeys.try_emplace(Fold(name));
-        if (added) it->second.name = name;
+        if (added)
+            it->second.name = name;
         key = &it->second;
     }
     return *key;
@@ -348,21 +388,25 @@ K* FindIn(K& root, const KeyPath& path) {
     K* key = &root;
     for (const std::string& name : path) {
         auto it = key->subkeys.find(Fold(name));
-        if (it == key->subkeys.end()) return nullptr;
+        if (it == key->subkeys.end())
+            return nullptr;
         key = &it->second;
     }
     return key;
 }
 
 void RemoveKey(Key& root, const KeyPath& path) {
-    if (path.empty()) return;  // a root is never removed
+    if (path.empty())
+        return;  // a root is never removed
     KeyPath parent(path.begin(), path.end() - 1);
-    if (Key* key = FindIn(root, parent)) key->subkeys.erase(Fold(path.back()));
+    if (Key* key = FindIn(root, parent))
+        key->subkeys.erase(Fold(path.back()));
 }
 
 void SetIn(Key& key, const std::string& name, const Value& value) {
     auto [it, added] = key.values.try_emplace(Fold(name));
-    if (added) it->second.name = name;
+    if (added)
+        it->second.name = name;
     it->second.value = value;
 }
 
@@ -381,13 +425,15 @@ Value Value::String(const std::string& text) {
 Value Value::Dword(uint32_t number) {
     Value value;
     value.type = RegistryStore::ValueType::Dword;
-    for (int i = 0; i < 4; ++i) value.data += static_cast<char>((number >> (8 * i)) & 0xFF);
+    for (int i = 0; i < 4; ++i)
+        value.data += static_cast<char>((number >> (8 * i)) & 0xFF);
     return value;
 }
 
 std::string Fold(std::string_view name) {
     std::string folded(name);
-    for (char& c : folded) c = Upper(c);
+    for (char& c : folded)
+        c = Upper(c);
     return folded;
 }
 
@@ -396,22 +442,27 @@ KeyPath SplitKeyPath(std::string_view path) {
     std::size_t start = 0;
     while (start <= path.size()) {
         std::size_t end = path.find('\\', start);
-        if (end == std::string_view::npos) end = path.size();
-        if (end > start) names.emplace_back(path.substr(start, end - start));
+        if (end == std::string_view::npos)
+            end = path.size();
+        if (end > start)
+            names.emplace_back(path.substr(start, end - start));
         start = end + 1;
     }
     return names;
 }
 
 bool SameContent(const Key& a, const Key& b) {
-    if (a.subkeys.size() != b.subkeys.size() || a.values.size() != b.values.size()) return false;
+    if (a.subkeys.size() != b.subkeys.size() || a.values.size() != b.values.size())
+        return false;
     for (const auto& [folded, value] : a.values) {
         auto other = b.values.find(folded);
-        if (other == b.values.end() || !(other->second.value == value.value)) return false;
+        if (other == b.values.end() || !(other->second.value == value.value))
+            return false;
     }
     for (const auto& [folded, subkey] : a.subkeys) {
         auto other = b.subkeys.find(folded);
-        if (other == b.subkeys.end() || !SameContent(subkey, other->second)) return false;
+        if (other == b.subkeys.end() || !SameContent(subkey, other->second))
+            return false;
     }
     return true;
 }
@@ -422,7 +473,8 @@ Document Document::Parse(std::string_view bytes) {
     auto begins = [&](std::string_view mark) { return bytes.substr(0, mark.size()) == mark; };
     if (begins("\xFF\xFE")) {
         bytes.remove_prefix(2);
-        if (bytes.size() % 2 != 0) return Unreadable();
+        if (bytes.size() % 2 != 0)
+            return Unreadable();
         return FromText(Utf16LeToText(bytes), Encoding::Utf16Le, true);
     }
     if (begins("\xEF\xBB\xBF")) {
@@ -430,7 +482,8 @@ Document Document::Parse(std::string_view bytes) {
     }
     // UTF-16LE without a byte-order mark: the header's first letter has a zero high byte.
     if (bytes.size() >= 2 && bytes[0] != '\0' && bytes[1] == '\0') {
-        if (bytes.size() % 2 != 0) return Unreadable();
+        if (bytes.size() % 2 != 0)
+            return Unreadable();
         return FromText(Utf16LeToText(bytes), Encoding::Utf16Le, false);
     }
     return FromText(std::string(bytes), Encoding::Utf8, false);
@@ -447,7 +500,8 @@ Document Document::FromText(std::string text, Encoding encoding, bool byteOrderM
     document.encoding_ = encoding;
     document.byteOrderMark_ = byteOrderMark;
     document.Classify(text);
-    if (document.understood_) document.Build();
+    if (document.understood_)
+        document.Build();
     return document;
 }
 
@@ -499,7 +553,8 @@ void Document::Classify(const std::string& text) {
             if (section.back() == ']' && section.size() > 2) {
                 std::string_view inner = section.substr(1, section.size() - 2);
                 const bool removal = inner.front() == '-';
-                if (removal) inner.remove_prefix(1);
+                if (removal)
+                    inner.remove_prefix(1);
                 KeyPath names = SplitKeyPath(inner);
                 const std::size_t rootEnd = inner.find('\\');
                 const std::string_view root = inner.substr(0, rootEnd);
@@ -555,14 +610,17 @@ void Document::Build() {
                 current = line.currentUser ? &EnsureKey(root_, line.path) : nullptr;
                 break;
             case LineKind::DeleteSection:
-                if (line.currentUser) RemoveKey(root_, line.path);
+                if (line.currentUser)
+                    RemoveKey(root_, line.path);
                 current = nullptr;
                 break;
             case LineKind::Value:
-                if (current) SetIn(*current, line.name, line.value);
+                if (current)
+                    SetIn(*current, line.name, line.value);
                 break;
             case LineKind::DeleteValue:
-                if (current) current->values.erase(Fold(line.name));
+                if (current)
+                    current->values.erase(Fold(line.name));
                 break;
             default:
                 break;
@@ -589,7 +647,8 @@ std::string Document::RenderValueLine(const std::string& name, const Value& valu
     const std::string left = name.empty() ? "@=" : Quote(name) + "=";
     if (value.type == RegistryStore::ValueType::Dword && value.data.size() == 4) {
         uint32_t number = 0;
-        for (int i = 3; i >= 0; --i) number = number << 8 | static_cast<unsigned char>(value.data[i]);
+        for (int i = 3; i >= 0; --i)
+            number = number << 8 | static_cast<unsigned char>(value.data[i]);
         char digits[16];
         std::snprintf(digits, sizeof digits, "dword:%08x", number);
         return left + digits;
@@ -599,16 +658,19 @@ std::string Document::RenderValueLine(const std::string& name, const Value& valu
     const std::string& data = value.data;
     const bool quotable = !data.empty() && data.back() == '\0' &&
                           data.find_first_of(std::string("\r\n\0", 3)) == data.size() - 1;
-    if (quotable) return left + Quote(std::string_view(data).substr(0, data.size() - 1));
+    if (quotable)
+        return left + Quote(std::string_view(data).substr(0, data.size() - 1));
     std::string bytes = data;
-    if (unicode_) bytes = TextToUtf16Le(data).value_or(std::string());
+    if (unicode_)
+        bytes = TextToUtf16Le(data).value_or(std::string());
     return HexList(bytes, left + "hex(1):", Newline());
 }
 
 std::vector<std::string> Document::Raws() const {
     std::vector<std::string> raws;
     raws.reserve(lines_.size() + 4);
-    for (const Line& line : lines_) raws.push_back(line.raw);
+    for (const Line& line : lines_)
+        raws.push_back(line.raw);
     if (!hasHeader_) {
         // A store without a header yet (empty): it starts with one.
         raws.insert(raws.begin(), std::string(kHeader5) + Newline());
@@ -620,23 +682,27 @@ void Document::AppendSection(std::vector<std::string>& raws, const KeyPath& path
                              const std::string& valueLine) const {
     const std::string newline = Newline();
     if (!raws.empty()) {
-        if (!EndsWithNewline(raws.back())) raws.back() += newline;
-        if (!Trim(Content(raws.back())).empty()) raws.push_back(newline);
+        if (!EndsWithNewline(raws.back()))
+            raws.back() += newline;
+        if (!Trim(Content(raws.back())).empty())
+            raws.push_back(newline);
     }
     std::string section = "[" + std::string(kRootName);
-    if (!path.empty()) section += "\\" + JoinPath(path);
+    if (!path.empty())
+        section += "\\" + JoinPath(path);
     raws.push_back(section + "]" + newline);
-    if (!valueLine.empty()) raws.push_back(valueLine + newline);
+    if (!valueLine.empty())
+        raws.push_back(valueLine + newline);
 }
 
 Status Document::Commit(const std::vector<std::vector<std::string>>& candidates,
                         const Key& expected) {
     for (const std::vector<std::string>& raws : candidates) {
         std::string text;
-        for (const std::string& raw : raws) text += raw;
+        for (const std::string& raw : raws)
+            text += raw;
         Document changed = FromText(std::move(text), encoding_, byteOrderMark_);
-        if (!changed.understood_ || !SameContent(changed.root_, expected) ||
-            !changed.Serialize()) {
+        if (!changed.understood_ || !SameContent(changed.root_, expected) || !changed.Serialize()) {
             continue;
         }
         lines_ = std::move(changed.lines_);
@@ -650,11 +716,14 @@ Status Document::Commit(const std::vector<std::vector<std::string>>& candidates,
 }
 
 Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const Value& value) {
-    if (!understood_) return Code::BadDatabase;
+    if (!understood_)
+        return Code::BadDatabase;
     const Key* key = FindKey(keyPath);
-    if (key == nullptr) return Code::KeyDeleted;
+    if (key == nullptr)
+        return Code::KeyDeleted;
     auto existing = key->values.find(Fold(name));
-    if (existing != key->values.end() && existing->second.value == value) return Code::Success;
+    if (existing != key->values.end() && existing->second.value == value)
+        return Code::Success;
 
     Key expected = root_;
     SetIn(*FindIn(expected, keyPath), name, value);
@@ -670,7 +739,8 @@ Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const
         switch (line.kind) {
             case LineKind::Section:
                 inKey = line.currentUser && SamePath(line.path, keyPath);
-                if (inKey) insertAt = i + 1;
+                if (inKey)
+                    insertAt = i + 1;
                 break;
             case LineKind::DeleteSection:
                 inKey = false;
@@ -681,18 +751,21 @@ Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const
                 break;
             case LineKind::Value:
                 if (inKey) {
-                    if (EqualsNoCase(line.name, name)) assignment = i;
+                    if (EqualsNoCase(line.name, name))
+                        assignment = i;
                     insertAt = i + 1;
                 }
                 break;
             case LineKind::DeleteValue:
                 if (inKey) {
-                    if (EqualsNoCase(line.name, name)) assignment = kNone;
+                    if (EqualsNoCase(line.name, name))
+                        assignment = kNone;
                     insertAt = i + 1;
                 }
                 break;
             case LineKind::Other:
-                if (inKey) insertAt = i + 1;
+                if (inKey)
+                    insertAt = i + 1;
                 break;
             default:
                 break;
@@ -709,7 +782,8 @@ Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const
     } else if (insertAt != kNone) {
         std::vector<std::string> raws = Raws();
         const std::size_t at = insertAt + offset;
-        if (!EndsWithNewline(raws[at - 1])) raws[at - 1] += Newline();
+        if (!EndsWithNewline(raws[at - 1]))
+            raws[at - 1] += Newline();
         raws.insert(raws.begin() + static_cast<std::ptrdiff_t>(at),
                     RenderValueLine(name, value) + Newline());
         candidates.push_back(std::move(raws));
@@ -721,8 +795,10 @@ Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const
 }
 
 Status Document::CreateKey(const KeyPath& keyPath) {
-    if (!understood_) return Code::BadDatabase;
-    if (FindKey(keyPath) != nullptr) return Code::Success;
+    if (!understood_)
+        return Code::BadDatabase;
+    if (FindKey(keyPath) != nullptr)
+        return Code::Success;
     Key expected = root_;
     EnsureKey(expected, keyPath);
     std::vector<std::string> raws = Raws();
@@ -731,11 +807,15 @@ Status Document::CreateKey(const KeyPath& keyPath) {
 }
 
 Status Document::DeleteKey(const KeyPath& keyPath) {
-    if (!understood_) return Code::BadDatabase;
-    if (keyPath.empty()) return Code::AccessDenied;
+    if (!understood_)
+        return Code::BadDatabase;
+    if (keyPath.empty())
+        return Code::AccessDenied;
     const Key* key = FindKey(keyPath);
-    if (key == nullptr) return Code::FileNotFound;
-    if (!key->subkeys.empty()) return Code::AccessDenied;
+    if (key == nullptr)
+        return Code::FileNotFound;
+    if (!key->subkeys.empty())
+        return Code::AccessDenied;
     Key expected = root_;
     RemoveKey(expected, keyPath);
 
@@ -753,11 +833,14 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
         std::size_t next = i + 1;
         for (; next < lines_.size(); ++next) {
             const LineKind kind = lines_[next].kind;
-            if (kind == LineKind::Section || kind == LineKind::DeleteSection) break;
-            if (kind != LineKind::Blank && kind != LineKind::Comment) last = next;
+            if (kind == LineKind::Section || kind == LineKind::DeleteSection)
+                break;
+            if (kind != LineKind::Blank && kind != LineKind::Comment)
+                last = next;
         }
         std::size_t end = last + 1;
-        while (end < next && lines_[end].kind == LineKind::Blank) ++end;
+        while (end < next && lines_[end].kind == LineKind::Blank)
+            ++end;
         std::fill(drop.begin() + static_cast<std::ptrdiff_t>(i),
                   drop.begin() + static_cast<std::ptrdiff_t>(end), true);
     }
@@ -765,7 +848,8 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
     const std::vector<std::string> raws = Raws();
     const std::size_t offset = raws.size() - lines_.size();
     for (std::size_t i = 0; i < raws.size(); ++i) {
-        if (i < offset || !drop[i - offset]) removed.push_back(raws[i]);
+        if (i < offset || !drop[i - offset])
+            removed.push_back(raws[i]);
     }
     // The parent may have existed only through the sections just taken out.
     std::vector<std::string> withParent = removed;
@@ -773,20 +857,25 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
     // Always right, if less tidy: a removal line at the end.
     std::vector<std::string> removalLine = raws;
     const std::string newline = Newline();
-    if (!EndsWithNewline(removalLine.back())) removalLine.back() += newline;
-    if (!Trim(Content(removalLine.back())).empty()) removalLine.push_back(newline);
-    removalLine.push_back("[-" + std::string(kRootName) + "\\" + JoinPath(keyPath) + "]" +
-                          newline);
+    if (!EndsWithNewline(removalLine.back()))
+        removalLine.back() += newline;
+    if (!Trim(Content(removalLine.back())).empty())
+        removalLine.push_back(newline);
+    removalLine.push_back("[-" + std::string(kRootName) + "\\" + JoinPath(keyPath) + "]" + newline);
     return Commit({removed, withParent, removalLine}, expected);
 }
 
 std::optional<std::string> Document::Serialize() const {
-    if (!understood_) return std::nullopt;
+    if (!understood_)
+        return std::nullopt;
     std::string text;
-    for (const std::string& raw : Raws()) text += raw;
-    if (encoding_ == Encoding::Utf8) return (byteOrderMark_ ? "\xEF\xBB\xBF" : "") + text;
+    for (const std::string& raw : Raws())
+        text += raw;
+    if (encoding_ == Encoding::Utf8)
+        return (byteOrderMark_ ? "\xEF\xBB\xBF" : "") + text;
     auto bytes = TextToUtf16Le(text);
-    if (!bytes) return std::nullopt;
+    if (!bytes)
+        return std::nullopt;
     return (byteOrderMark_ ? std::string("\xFF\xFE") : std::string()) + *bytes;
 }
 

@@ -75,7 +75,7 @@ KeyPath SplitKeyPath(std::string_view path);
 bool SameContent(const Key& a, const Key& b);
 
 class Document {
-public:
+  public:
     enum class Encoding { Utf8, Utf16Le };
 
     // Reads the file's bytes. Never fails: what cannot be read is left out. A text that is
@@ -102,8 +102,17 @@ public:
     // The file's bytes, in its own encoding; nothing when the text cannot be encoded in it.
     std::optional<std::string> Serialize() const;
 
-private:
-    enum class LineKind { Blank, Comment, Header, Section, DeleteSection, Value, DeleteValue, Other };
+  private:
+    enum class LineKind {
+        Blank,
+        Comment,
+        Header,
+        Section,
+        DeleteSection,
+        Value,
+        DeleteValue,
+        Other
+    };
 
     // One logical line: a physical line, or several joined by continuation.
     struct Line {

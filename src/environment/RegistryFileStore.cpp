@@ -26,7 +26,7 @@ namespace Code = StatusCode;
 constexpr uint32_t kChangeRights = 0x0002 | 0x0004 | 0x10000;
 
 class FileStore final : public Backend {
-public:
+  public:
     explicit FileStore(std::string path) : path_(std::move(path)) {}
 
     std::optional<std::string> File() const override { return path_; }
@@ -36,17 +36,20 @@ public:
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(parent, path, unreadable)) return status;
+        if (Status status = Resolve(parent, path, unreadable))
+            return status;
         Append(path, subKey);
         const std::shared_ptr<const Document> document = Snapshot();
         if (unreadable || !document->Understood()) {
             // Whether the key exists cannot be told. A key opened for changes is handed out
             // so that the change itself is what gets refused, with its own failure.
-            if ((access & kChangeRights) == 0) return Code::BadDatabase;
+            if ((access & kChangeRights) == 0)
+                return Code::BadDatabase;
             result = NewHandle(std::move(path), true);
             return Code::Success;
         }
-        if (document->FindKey(path) == nullptr) return Code::FileNotFound;
+        if (document->FindKey(path) == nullptr)
+            return Code::FileNotFound;
         result = NewHandle(std::move(path), false);
         return Code::Success;
     }
@@ -55,7 +58,8 @@ public:
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(parent, path, unreadable)) return status;
+        if (Status status = Resolve(parent, path, unreadable))
+            return status;
         Append(path, subKey);
         if (Status status = Change([&](Document& d) { return d.CreateKey(path); })) {
             return status;
@@ -66,7 +70,8 @@ public:
 
     Status CloseKey(KeyHandle key) override {
         std::lock_guard lock(mutex_);
-        if (key == LibRegistry::kCurrentUser) return Code::Success;
+        if (key == LibRegistry::kCurrentUser)
+            return Code::Success;
         return handles_.erase(key) != 0 ? Code::Success : Code::InvalidHandle;
     }
 
@@ -75,22 +80,28 @@ public:
         std::lock_guard lock(mutex_);
         const RegistryFile::Key* found = nullptr;
         std::shared_ptr<const Document> document;
-        if (Status status = FindOpenKey(key, document, found)) return status;
+        if (Status status = FindOpenKey(key, document, found))
+            return status;
         auto value = found->values.find(RegistryFile::Fold(valueName));
-        if (value == found->values.end()) return Code::FileNotFound;
+        if (value == found->values.end())
+            return Code::FileNotFound;
         const RegistryFile::Value& stored = value->second.value;
-        if (stored.opaque) return Code::UnsupportedType;
+        if (stored.opaque)
+            return Code::UnsupportedType;
         const auto length = static_cast<uint32_t>(stored.data.size());
         if (data != nullptr) {
-            if (size == nullptr) return Code::InvalidParameter;
+            if (size == nullptr)
+                return Code::InvalidParameter;
             if (*size < length) {
                 *size = length;
                 return Code::MoreData;
             }
             std::memcpy(data, stored.data.data(), length);
         }
-        if (type != nullptr) *type = stored.type;
-        if (size != nullptr) *size = length;
+        if (type != nullptr)
+            *type = stored.type;
+        if (size != nullptr)
+            *size = length;
         return Code::Success;
     }
 
@@ -107,7 +118,8 @@ public:
         std::lock_guard lock(mutex_);
         const RegistryFile::Key* found = nullptr;
         std::shared_ptr<const Document> document;
-        if (Status status = FindOpenKey(key, document, found)) return status;
+        if (Status status = FindOpenKey(key, document, found))
+            return status;
         count = static_cast<uint32_t>(found->subkeys.size());
         return Code::Success;
     }
@@ -116,11 +128,15 @@ public:
         std::lock_guard lock(mutex_);
         const RegistryFile::Key* found = nullptr;
         std::shared_ptr<const Document> document;
-        if (Status status = FindOpenKey(key, document, found)) return status;
-        if (name == nullptr || nameChars == nullptr) return Code::InvalidParameter;
-        if (index >= found->subkeys.size()) return Code::NoMoreItems;
+        if (Status status = FindOpenKey(key, document, found))
+            return status;
+        if (name == nullptr || nameChars == nullptr)
+            return Code::InvalidParameter;
+        if (index >= found->subkeys.size())
+            return Code::NoMoreItems;
         const std::string& subkey = std::next(found->subkeys.begin(), index)->second.name;
-        if (subkey.size() + 1 > *nameChars) return Code::MoreData;
+        if (subkey.size() + 1 > *nameChars)
+            return Code::MoreData;
         std::memcpy(name, subkey.c_str(), subkey.size() + 1);
         *nameChars = static_cast<uint32_t>(subkey.size());
         return Code::Success;
@@ -130,14 +146,16 @@ public:
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable)) return status;
+        if (Status status = Resolve(key, path, unreadable))
+            return status;
         const KeyPath names = RegistryFile::SplitKeyPath(subKey);
-        if (names.empty()) return Code::AccessDenied;
+        if (names.empty())
+            return Code::AccessDenied;
         path.insert(path.end(), names.begin(), names.end());
         return Change([&](Document& d) { return d.DeleteKey(path); });
     }
 
-private:
+  private:
     struct OpenKeyEntry {
         KeyPath path;
         bool unreadableStore = false;  // opened while the store could not be read
@@ -162,7 +180,8 @@ private:
             return Code::Success;
         }
         auto entry = handles_.find(key);
-        if (entry == handles_.end()) return Code::InvalidHandle;
+        if (entry == handles_.end())
+            return Code::InvalidHandle;
         path = entry->second.path;
         unreadableStore = entry->second.unreadableStore;
         return Code::Success;
@@ -173,9 +192,11 @@ private:
                        const RegistryFile::Key*& found) {
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable)) return status;
+        if (Status status = Resolve(key, path, unreadable))
+            return status;
         document = Snapshot();
-        if (unreadable || !document->Understood()) return Code::BadDatabase;
+        if (unreadable || !document->Understood())
+            return Code::BadDatabase;
         found = document->FindKey(path);
         return found != nullptr ? Code::Success : Code::KeyDeleted;
     }
@@ -183,8 +204,10 @@ private:
     // The store as the file holds it now, read again only when the file changed.
     std::shared_ptr<const Document> Snapshot() {
         const std::optional<StoreFile::Stamp> stamp = StoreFile::StampOf(path_);
-        if (!stamp) return Unreadable();
-        if (cached_ && *stamp == cachedStamp_) return cached_;
+        if (!stamp)
+            return Unreadable();
+        if (cached_ && *stamp == cachedStamp_)
+            return cached_;
         std::string bytes;
         StoreFile::Stamp readStamp;
         switch (StoreFile::ReadAll(path_, bytes, readStamp)) {
@@ -214,7 +237,8 @@ private:
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable)) return status;
+        if (Status status = Resolve(key, path, unreadable))
+            return status;
         return Change([&](Document& d) { return d.SetValue(path, valueName, value); });
     }
 
@@ -223,7 +247,8 @@ private:
     Status Change(Edit&& edit) {
         const std::string target = StoreFile::WriteTarget(path_);
         StoreFile::FolderLock folderLock(target);
-        if (!folderLock.Held()) return Code::AccessDenied;
+        if (!folderLock.Held())
+            return Code::AccessDenied;
         std::string bytes;
         StoreFile::Stamp stamp;
         Document document = Document::Unreadable();
@@ -238,12 +263,17 @@ private:
                 return Code::BadDatabase;
         }
         // A store that cannot be understood is never overwritten.
-        if (!document.Understood()) return Code::BadDatabase;
-        if (Status status = edit(document)) return status;
-        if (!document.Modified()) return Code::Success;
+        if (!document.Understood())
+            return Code::BadDatabase;
+        if (Status status = edit(document))
+            return status;
+        if (!document.Modified())
+            return Code::Success;
         const std::optional<std::string> text = document.Serialize();
-        if (!text) return Code::InvalidData;
-        if (!StoreFile::Replace(target, *text)) return Code::WriteFault;
+        if (!text)
+            return Code::InvalidData;
+        if (!StoreFile::Replace(target, *text))
+            return Code::WriteFault;
         if (const std::optional<StoreFile::Stamp> written = StoreFile::StampOf(path_)) {
             Remember(std::make_shared<const Document>(std::move(document)), *written);
         }

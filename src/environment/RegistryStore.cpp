@@ -23,9 +23,11 @@ std::string Environment(const char* name) {
 }
 
 std::unique_ptr<Backend> Choose(const std::optional<std::string>& fileOption) {
-    if (fileOption && !fileOption->empty()) return OpenFileStore(*fileOption);
+    if (fileOption && !fileOption->empty())
+        return OpenFileStore(*fileOption);
     const std::string named = Environment("VANTORI_REGISTRY");
-    if (!named.empty()) return OpenFileStore(named);
+    if (!named.empty())
+        return OpenFileStore(named);
 #ifdef _WIN32
     return OpenWindowsRegistry();
 #else
@@ -35,12 +37,17 @@ std::unique_ptr<Backend> Choose(const std::optional<std::string>& fileOption) {
 
 }  // namespace
 
-void Select(const std::optional<std::string>& fileOption) { Installed() = Choose(fileOption); }
+void Select(const std::optional<std::string>& fileOption) {
+    Installed() = Choose(fileOption);
+}
 
-std::optional<std::string> CurrentFile() { return Current().File(); }
+std::optional<std::string> CurrentFile() {
+    return Current().File();
+}
 
 Backend& Current() {
-    if (!Installed()) Installed() = Choose(std::nullopt);
+    if (!Installed())
+        Installed() = Choose(std::nullopt);
     return *Installed();
 }
 
@@ -58,7 +65,8 @@ std::string DefaultStoreFile() {
 #else
         std::string home = Environment("HOME");
         if (home.empty()) {
-            if (const passwd* user = ::getpwuid(::getuid())) home = user->pw_dir;
+            if (const passwd* user = ::getpwuid(::getuid()))
+                home = user->pw_dir;
         }
         config = fs::path(home) / ".config";
 #endif

@@ -52,7 +52,7 @@ inline constexpr uint32_t Dword = 4;
 // RegQueryInfoKeyA, RegEnumKeyExA, RegDeleteKeyA), status codes included. Handles are
 // opened relative to a parent handle, which may be the root LibRegistry::kCurrentUser.
 class Backend {
-public:
+  public:
     virtual ~Backend() = default;
 
     // The settings file behind the store, or nothing for the real registry.
@@ -77,8 +77,7 @@ public:
     // The name of the subkey at index (in the store's order) into name, a buffer of
     // *nameChars characters; on success *nameChars is the name's length without the NUL.
     // Past the last subkey: NoMoreItems; a name that does not fit: MoreData.
-    virtual Status EnumSubkey(KeyHandle key, uint32_t index, char* name,
-                              uint32_t* nameChars) = 0;
+    virtual Status EnumSubkey(KeyHandle key, uint32_t index, char* name, uint32_t* nameChars) = 0;
     // Deletes a subkey that has no subkeys of its own (AccessDenied otherwise).
     virtual Status DeleteSubkey(KeyHandle key, const std::string& subKey) = 0;
 };

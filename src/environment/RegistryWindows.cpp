@@ -14,17 +14,20 @@ HKEY ToKey(KeyHandle handle) {
     return handle == LibRegistry::kCurrentUser ? HKEY_CURRENT_USER : reinterpret_cast<HKEY>(handle);
 }
 
-KeyHandle ToHandle(HKEY key) { return reinterpret_cast<KeyHandle>(key); }
+KeyHandle ToHandle(HKEY key) {
+    return reinterpret_cast<KeyHandle>(key);
+}
 
 class WindowsRegistry final : public Backend {
-public:
+  public:
     std::optional<std::string> File() const override { return std::nullopt; }
 
     Status OpenKey(KeyHandle parent, const std::string& subKey, uint32_t access,
                    KeyHandle& result) override {
         HKEY key = nullptr;
         const LONG status = RegOpenKeyExA(ToKey(parent), subKey.c_str(), 0, access, &key);
-        if (status == ERROR_SUCCESS) result = ToHandle(key);
+        if (status == ERROR_SUCCESS)
+            result = ToHandle(key);
         return status;
     }
 
@@ -34,12 +37,14 @@ public:
         const LONG status =
             RegCreateKeyExA(ToKey(parent), subKey.c_str(), 0, nullptr, REG_OPTION_NON_VOLATILE,
                             KEY_ALL_ACCESS, nullptr, &key, &disposition);
-        if (status == ERROR_SUCCESS) result = ToHandle(key);
+        if (status == ERROR_SUCCESS)
+            result = ToHandle(key);
         return status;
     }
 
     Status CloseKey(KeyHandle key) override {
-        if (key == LibRegistry::kCurrentUser) return ERROR_SUCCESS;
+        if (key == LibRegistry::kCurrentUser)
+            return ERROR_SUCCESS;
         return RegCloseKey(ToKey(key));
     }
 
@@ -49,8 +54,10 @@ public:
         DWORD length = size != nullptr ? *size : 0;
         const LONG status = RegQueryValueExA(ToKey(key), valueName.c_str(), nullptr, &valueType,
                                              data, size != nullptr ? &length : nullptr);
-        if (type != nullptr) *type = valueType;
-        if (size != nullptr) *size = length;
+        if (type != nullptr)
+            *type = valueType;
+        if (size != nullptr)
+            *size = length;
         return status;
     }
 
@@ -69,19 +76,22 @@ public:
 
     Status QuerySubkeyCount(KeyHandle key, uint32_t& count) override {
         DWORD subkeys = 0;
-        const LONG status = RegQueryInfoKeyA(ToKey(key), nullptr, nullptr, nullptr, &subkeys,
-                                             nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
-                                             nullptr);
-        if (status == ERROR_SUCCESS) count = subkeys;
+        const LONG status =
+            RegQueryInfoKeyA(ToKey(key), nullptr, nullptr, nullptr, &subkeys, nullptr, nullptr,
+                             nullptr, nullptr, nullptr, nullptr, nullptr);
+        if (status == ERROR_SUCCESS)
+            count = subkeys;
         return status;
     }
 
     Status EnumSubkey(KeyHandle key, uint32_t index, char* name, uint32_t* nameChars) override {
-        if (nameChars == nullptr) return ERROR_INVALID_PARAMETER;
+        if (nameChars == nullptr)
+            return ERROR_INVALID_PARAMETER;
         DWORD chars = *nameChars;
         const LONG status =
             RegEnumKeyExA(ToKey(key), index, name, &chars, nullptr, nullptr, nullptr, nullptr);
-        if (status == ERROR_SUCCESS) *nameChars = chars;
+        if (status == ERROR_SUCCESS)
+            *nameChars = chars;
         return status;
     }
 
@@ -92,7 +102,9 @@ public:
 
 }  // namespace
 
-std::unique_ptr<Backend> OpenWindowsRegistry() { return std::make_unique<WindowsRegistry>(); }
+std::unique_ptr<Backend> OpenWindowsRegistry() {
+    return std::make_unique<WindowsRegistry>();
+}
 
 }  // namespace vtr::RegistryStore
 

@@ -41,7 +41,8 @@ void RemoveStaleTemporaries(const std::string& path) {
     for (fs::directory_iterator it(FolderOf(path), error), end; !error && it != end;
          it.increment(error)) {
         const std::string name = it->path().filename().string();
-        if (name.size() == prefix.size() + kTempUniqueChars && name.compare(0, prefix.size(), prefix) == 0) {
+        if (name.size() == prefix.size() + kTempUniqueChars &&
+            name.compare(0, prefix.size(), prefix) == 0) {
             std::error_code ignored;
             fs::remove(it->path(), ignored);
         }
@@ -54,7 +55,8 @@ std::string WriteTarget(const std::string& path) {
     std::error_code error;
     if (fs::is_symlink(path, error)) {
         const fs::path target = fs::weakly_canonical(path, error);
-        if (!error) return target.string();
+        if (!error)
+            return target.string();
     }
     return path;
 }
@@ -90,14 +92,16 @@ bool IsMissing(DWORD error) {
 std::string MutexName(const std::string& folder) {
     std::error_code error;
     std::string absolute = fs::absolute(folder, error).string();
-    if (error) absolute = folder;
+    if (error)
+        absolute = folder;
     uint64_t hash = 1469598103934665603ull;  // FNV-1a
     for (char c : absolute) {
         const char lower = (c >= 'A' && c <= 'Z') ? static_cast<char>(c - 'A' + 'a') : c;
         hash = (hash ^ static_cast<unsigned char>(lower == '/' ? '\\' : lower)) * 1099511628211ull;
     }
     char name[64];
-    wsprintfA(name, "Local\\VantoriSettingsStore-%08lx%08lx", static_cast<unsigned long>(hash >> 32),
+    wsprintfA(name, "Local\\VantoriSettingsStore-%08lx%08lx",
+              static_cast<unsigned long>(hash >> 32),
               static_cast<unsigned long>(hash & 0xFFFFFFFFu));
     return name;
 }
@@ -109,12 +113,14 @@ std::optional<Stamp> StampOf(const std::string& path) {
                               FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
                               OPEN_EXISTING, FILE_FLAG_BACKUP_SEMANTICS, nullptr);
     if (file == INVALID_HANDLE_VALUE) {
-        if (IsMissing(GetLastError())) return Stamp{};
+        if (IsMissing(GetLastError()))
+            return Stamp{};
         return std::nullopt;
     }
     const Stamp stamp = StampOfHandle(file);
     CloseHandle(file);
-    if (!stamp.exists) return std::nullopt;
+    if (!stamp.exists)
+        return std::nullopt;
     return stamp;
 }
 
@@ -148,15 +154,18 @@ FolderLock::FolderLock(const std::string& storePath) {
     std::error_code error;
     fs::create_directories(folder, error);
     mutex_ = CreateMutexA(nullptr, FALSE, MutexName(folder).c_str());
-    if (mutex_ == nullptr) return;
+    if (mutex_ == nullptr)
+        return;
     const DWORD waited = WaitForSingleObject(static_cast<HANDLE>(mutex_), INFINITE);
     // An abandoned lock (its holder died) is ours now; the store is whole either way.
     held_ = waited == WAIT_OBJECT_0 || waited == WAIT_ABANDONED;
 }
 
 FolderLock::~FolderLock() {
-    if (mutex_ == nullptr) return;
-    if (held_) ReleaseMutex(static_cast<HANDLE>(mutex_));
+    if (mutex_ == nullptr)
+        return;
+    if (held_)
+        ReleaseMutex(static_cast<HANDLE>(mutex_));
     CloseHandle(static_cast<HANDLE>(mutex_));
 }
 
@@ -171,13 +180,16 @@ bool Replace(const std::string& path, const std::string& bytes) {
         unsigned long long seed = (static_cast<unsigned long long>(GetCurrentProcessId()) << 32) ^
                                   GetTickCount64() ^ (++counter * 2654435761u);
         std::string unique;
-        for (std::size_t i = 0; i < kTempUniqueChars; ++i, seed /= 36) unique += kDigits[seed % 36];
+        for (std::size_t i = 0; i < kTempUniqueChars; ++i, seed /= 36)
+            unique += kDigits[seed % 36];
         temp = (fs::path(folder) / (TempPrefix(path) + unique)).string();
         file = CreateFileA(temp.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_NEW,
                            FILE_ATTRIBUTE_NORMAL, nullptr);
-        if (file == INVALID_HANDLE_VALUE && GetLastError() != ERROR_FILE_EXISTS) return false;
+        if (file == INVALID_HANDLE_VALUE && GetLastError() != ERROR_FILE_EXISTS)
+            return false;
     }
-    if (file == INVALID_HANDLE_VALUE) return false;
+    if (file == INVALID_HANDLE_VALUE)
+        return false;
     bool ok = true;
     for (std::size_t done = 0; ok && done < bytes.size();) {
         const DWORD chunk = static_cast<DWORD>(std::min<std::size_t>(bytes.size() - done, 1 << 20));
@@ -193,7 +205,8 @@ bool Replace(const std::string& path, const std::string& bytes) {
                         MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH)) {
             return true;
         }
-        if (attempt == 20) ok = false;
+        if (attempt == 20)
+            ok = false;
         Sleep(50);
     }
     DeleteFileA(temp.c_str());
@@ -224,7 +237,8 @@ bool WriteFully(int fd, const std::string& bytes) {
     for (std::size_t done = 0; done < bytes.size();) {
         const ssize_t written = ::write(fd, bytes.data() + done, bytes.size() - done);
         if (written < 0) {
-            if (errno == EINTR) continue;
+            if (errno == EINTR)
+                continue;
             return false;
         }
         done += static_cast<std::size_t>(written);
@@ -237,7 +251,8 @@ bool WriteFully(int fd, const std::string& bytes) {
 std::optional<Stamp> StampOf(const std::string& path) {
     struct stat status;
     if (::stat(path.c_str(), &status) != 0) {
-        if (errno == ENOENT || errno == ENOTDIR) return Stamp{};
+        if (errno == ENOENT || errno == ENOTDIR)
+            return Stamp{};
         return std::nullopt;
     }
     return StampOfStat(status);
@@ -257,7 +272,8 @@ ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
         char buffer[65536];
         while (true) {
             const ssize_t got = ::read(fd, buffer, sizeof buffer);
-            if (got < 0 && errno == EINTR) continue;
+            if (got < 0 && errno == EINTR)
+                continue;
             if (got <= 0) {
                 ok = got == 0;
                 break;
@@ -274,7 +290,8 @@ FolderLock::FolderLock(const std::string& storePath) {
     std::error_code error;
     fs::create_directories(folder, error);
     folder_ = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (folder_ < 0) return;
+    if (folder_ < 0)
+        return;
     int result;
     do {
         result = ::flock(folder_, LOCK_EX);
@@ -284,7 +301,8 @@ FolderLock::FolderLock(const std::string& storePath) {
 
 FolderLock::~FolderLock() {
     // Closing the descriptor releases the lock.
-    if (folder_ >= 0) ::close(folder_);
+    if (folder_ >= 0)
+        ::close(folder_);
 }
 
 bool Replace(const std::string& path, const std::string& bytes) {
@@ -293,11 +311,13 @@ bool Replace(const std::string& path, const std::string& bytes) {
     std::string temp =
         (fs::path(folder) / (TempPrefix(path) + std::string(kTempUniqueChars, 'X'))).string();
     const int fd = ::mkstemp(temp.data());
-    if (fd < 0) return false;
+    if (fd < 0)
+        return false;
     ::fcntl(fd, F_SETFD, FD_CLOEXEC);
     // The new version keeps the old one's permissions; a new store is private to the user.
     struct stat old;
-    if (::stat(path.c_str(), &old) == 0) ::fchmod(fd, old.st_mode & 07777);
+    if (::stat(path.c_str(), &old) == 0)
+        ::fchmod(fd, old.st_mode & 07777);
     bool ok = WriteFully(fd, bytes) && ::fsync(fd) == 0;
     ok = ::close(fd) == 0 && ok;
     ok = ok && ::rename(temp.c_str(), path.c_str()) == 0;

@@ -37,7 +37,7 @@ std::string WriteTarget(const std::string& path);
 // folder itself, which is never replaced, so nothing is created for it and nothing is left
 // behind. Creates the folder when it does not exist.
 class FolderLock {
-public:
+  public:
     explicit FolderLock(const std::string& storePath);
     ~FolderLock();
     FolderLock(const FolderLock&) = delete;
@@ -45,7 +45,7 @@ public:
 
     bool Held() const { return held_; }
 
-private:
+  private:
     bool held_ = false;
 #ifdef _WIN32
     void* mutex_ = nullptr;

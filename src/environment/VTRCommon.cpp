@@ -38,15 +38,18 @@ std::string ExecutablePath() {
     while (true) {
         const DWORD length =
             GetModuleFileNameA(nullptr, buffer.data(), static_cast<DWORD>(buffer.size()));
-        if (length == 0) return {};
-        if (length < buffer.size()) return buffer.substr(0, length);
+        if (length == 0)
+            return {};
+        if (length < buffer.size())
+            return buffer.substr(0, length);
         buffer.resize(buffer.size() * 2);
     }
 #elif defined(__APPLE__)
     uint32_t size = 0;
     _NSGetExecutablePath(nullptr, &size);
     std::vector<char> buffer(size + 1, '\0');
-    if (_NSGetExecutablePath(buffer.data(), &size) != 0) return {};
+    if (_NSGetExecutablePath(buffer.data(), &size) != 0)
+        return {};
     std::error_code error;
     const auto path = std::filesystem::weakly_canonical(buffer.data(), error);
     return error ? std::string(buffer.data()) : path.string();
@@ -54,7 +57,8 @@ std::string ExecutablePath() {
     int name[4] = {CTL_KERN, KERN_PROC, KERN_PROC_PATHNAME, -1};
     char buffer[4096];
     size_t size = sizeof buffer;
-    if (sysctl(name, 4, buffer, &size, nullptr, 0) != 0) return {};
+    if (sysctl(name, 4, buffer, &size, nullptr, 0) != 0)
+        return {};
     return std::string(buffer);
 #else
     std::error_code error;
@@ -67,8 +71,8 @@ std::string ExecutablePath() {
 
 std::string GetAppPath() {
     // Read afresh on every call; the cache is only written.
-    Cached().appPath = LibFile::AddTrailingBackslash(
-        LibRegistryVTRShared::GetSharedString("AppPath", "", ""));
+    Cached().appPath =
+        LibFile::AddTrailingBackslash(LibRegistryVTRShared::GetSharedString("AppPath", "", ""));
     return Cached().appPath;
 }
 
@@ -82,9 +86,13 @@ std::string GetUserDataPath() {
     return folders.userDataPath;
 }
 
-std::string GetWeeklyScheduleFile() { return GetUserDataPath() + "weeksched." + "lsc"; }
+std::string GetWeeklyScheduleFile() {
+    return GetUserDataPath() + "weeksched." + "lsc";
+}
 
-std::string GetYearlyScheduleFile() { return GetUserDataPath() + "yearsched." + "lsc"; }
+std::string GetYearlyScheduleFile() {
+    return GetUserDataPath() + "yearsched." + "lsc";
+}
 
 std::string GetProgramFolder() {
     std::string executable = ExecutablePath();
@@ -98,6 +106,8 @@ std::string GetProgramFolder() {
     return LibFile::AddTrailingBackslash(folder);
 }
 
-void ResetCachedFolders() { Cached() = Folders{}; }
+void ResetCachedFolders() {
+    Cached() = Folders{};
+}
 
 }  // namespace vtr::VTRCommon

@@ -17,7 +17,7 @@ using ::testing::ElementsAre;
 
 // Writes down what it is told, as "<who>:<what>".
 class RecordingClient : public INotificationClient {
-public:
+  public:
     RecordingClient(std::string name, std::vector<std::string>& log, bool fails = false)
         : name_(std::move(name)), log_(log), fails_(fails) {}
 
@@ -33,10 +33,11 @@ public:
     void TransientMessage(const std::string& message) override { Note(message); }
     void VerificationCancelled() override { Note("VerificationCancelled"); }
 
-private:
+  private:
     void Note(const std::string& what) {
         log_.push_back(name_ + ":" + what);
-        if (fails_) throw VtrError(5, "client", "client failed");
+        if (fails_)
+            throw VtrError(5, "client", "client failed");
     }
 
     std::string name_;
@@ -45,10 +46,11 @@ private:
 };
 
 class LibVerifyTest : public ::testing::Test {
-protected:
+  protected:
     void SetUp() override { Reset(); }
     void TearDown() override {
-        for (INotificationClient* client : registered_) LibVerify::RemoveNotificationClient(client);
+        for (INotificationClient* client : registered_)
+            LibVerify::RemoveNotificationClient(client);
         LibVerify::SetEventPump(nullptr);
         Reset();
     }
@@ -108,9 +110,9 @@ TEST_F(LibVerifyTest, ResultsAreSortedIntoCollectionsAndIgnoredOnesCountForNothi
     EXPECT_TRUE(LibVerify::GetIgnoredResults()[0]->Ignorable());
     EXPECT_FALSE(LibVerify::GetResults()[0]->Ignorable());
     // Every result is told, ignored ones too.
-    EXPECT_THAT(log_, ElementsAre("c:ResultAdded 23 ignored", "c:ResultAdded 23",
-                                  "c:ResultAdded 24 ignored", "c:ResultAdded 25",
-                                  "c:ResultAdded 1"));
+    EXPECT_THAT(log_,
+                ElementsAre("c:ResultAdded 23 ignored", "c:ResultAdded 23",
+                            "c:ResultAdded 24 ignored", "c:ResultAdded 25", "c:ResultAdded 1"));
 
     // Ignoring only errors and warnings leaves no error or warning counted.
     LibVerify::ClearResults();
@@ -235,15 +237,21 @@ TEST(ScopedMousePointer, SetsThroughTheHooksAndPutsTheFirstPointerBack) {
         busy.SetPointer(MousePointer::Hourglass);
         busy.SetPointer(MousePointer::Default);
     }
-    EXPECT_THAT(set, ElementsAre(MousePointer::Hourglass, MousePointer::Default,
-                                 MousePointer::Arrow));
+    EXPECT_THAT(set,
+                ElementsAre(MousePointer::Hourglass, MousePointer::Default, MousePointer::Arrow));
 
     // Failing hooks are ignored; without hooks nothing happens.
     ScopedMousePointer::InstallHooks([]() -> int16_t { throw std::runtime_error("no screen"); },
                                      [](int16_t) { throw std::runtime_error("no screen"); });
-    { ScopedMousePointer failing; failing.SetPointer(MousePointer::Hourglass); }
+    {
+        ScopedMousePointer failing;
+        failing.SetPointer(MousePointer::Hourglass);
+    }
     ScopedMousePointer::InstallHooks(nullptr, nullptr);
-    { ScopedMousePointer none; none.SetPointer(MousePointer::Hourglass); }
+    {
+        ScopedMousePointer none;
+        none.SetPointer(MousePointer::Hourglass);
+    }
 }
 
 }  // namespace

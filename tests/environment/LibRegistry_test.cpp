@@ -31,7 +31,7 @@ const char kHeader[] = "Windows Registry Editor Version 5.00\n\n";
 
 // Passes every operation on to a store and writes down the ones that matter here.
 class RecordingStore : public RegistryStore::Backend {
-public:
+  public:
     explicit RecordingStore(std::unique_ptr<RegistryStore::Backend> inner)
         : inner_(std::move(inner)) {}
 
@@ -39,13 +39,15 @@ public:
     RegistryStore::Status OpenKey(KeyHandle parent, const std::string& subKey, uint32_t access,
                                   KeyHandle& result) override {
         const auto status = inner_->OpenKey(parent, subKey, access, result);
-        if (status == 0) ++open;
+        if (status == 0)
+            ++open;
         return status;
     }
     RegistryStore::Status CreateKey(KeyHandle parent, const std::string& subKey,
                                     KeyHandle& result) override {
         const auto status = inner_->CreateKey(parent, subKey, result);
-        if (status == 0) ++open;
+        if (status == 0)
+            ++open;
         return status;
     }
     RegistryStore::Status CloseKey(KeyHandle key) override {
@@ -80,7 +82,7 @@ public:
     int open = 0;  // handles open now
     std::vector<std::string> calls;
 
-private:
+  private:
     std::unique_ptr<RegistryStore::Backend> inner_;
 };
 
@@ -150,7 +152,8 @@ TEST_F(LibRegistryTest, SuiteAndSharedKeysArePathsBelowTheSuiteKey) {
 TEST_F(LibRegistryTest, WritingCreatesTheKeyButReadingNeverDoes) {
     EXPECT_EQ(LibRegistryVTR::GetSuiteString("X", "New\\Deeper", "d"), "d");
     EXPECT_FALSE(testsupport::ReadFileBytes(StoreFile()).size());  // still no file
-    EXPECT_THAT(RaisedDescription([] { OpenRegistryKey(kCurrentUser, "Software\\Vantori\\New", kKeyRead); }),
+    EXPECT_THAT(RaisedDescription(
+                    [] { OpenRegistryKey(kCurrentUser, "Software\\Vantori\\New", kKeyRead); }),
                 "RegOpenKeyEx failure");
 
     LibRegistryVTR::SetSuiteString("X", "v", "New\\Deeper");
@@ -165,8 +168,9 @@ TEST_F(LibRegistryTest, WritingCreatesTheKeyButReadingNeverDoes) {
     KeyHandle written = OpenRegistryKey(kCurrentUser, "Software\\Made", kKeyWrite);
     CloseRegistryKey(written);
     EXPECT_THAT(ReadStore(), HasSubstr("[HKEY_CURRENT_USER\\Software\\Made]"));
-    EXPECT_THAT(RaisedDescription([] { OpenRegistryKey(kCurrentUser, "Software\\Other", kKeyAllAccess); }),
-                "RegOpenKeyEx failure");
+    EXPECT_THAT(
+        RaisedDescription([] { OpenRegistryKey(kCurrentUser, "Software\\Other", kKeyAllAccess); }),
+        "RegOpenKeyEx failure");
 }
 
 TEST_F(LibRegistryTest, WritersAndDeletersRaiseTheirOwnFailureTexts) {
@@ -175,8 +179,9 @@ TEST_F(LibRegistryTest, WritersAndDeletersRaiseTheirOwnFailureTexts) {
     WriteStore(notes);
     EXPECT_EQ(RaisedDescription([] { LibRegistryVTRShared::SetSharedString("AppPath", "x", ""); }),
               "RegSetValueEx failure");
-    EXPECT_EQ(RaisedDescription([] { LibRegistryVTRShared::SetSharedLong("PostInstallVer", 1, ""); }),
-              "RegSetValueEx failure");
+    EXPECT_EQ(
+        RaisedDescription([] { LibRegistryVTRShared::SetSharedLong("PostInstallVer", 1, ""); }),
+        "RegSetValueEx failure");
     EXPECT_EQ(RaisedDescription([] { CreateRegistryKey(kCurrentUser, "Software\\Vantori"); }),
               "RegCreateKeyEx failure");
     EXPECT_EQ(RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software", "Vantori"); }),
@@ -188,12 +193,15 @@ TEST_F(LibRegistryTest, WritersAndDeletersRaiseTheirOwnFailureTexts) {
 
     // Deleting what is not there, or a key that still has subkeys.
     WriteStore(std::string(kHeader) + "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared\\Sub]\n");
-    EXPECT_EQ(RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Vantori", "Gone"); }),
-              "RegDeleteKey failure");
-    EXPECT_EQ(RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Vantori", "Shared"); }),
-              "RegDeleteKey failure");
-    EXPECT_EQ(RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Gone", "Shared"); }),
-              "RegOpenKeyEx failure");
+    EXPECT_EQ(
+        RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Vantori", "Gone"); }),
+        "RegDeleteKey failure");
+    EXPECT_EQ(
+        RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Vantori", "Shared"); }),
+        "RegDeleteKey failure");
+    EXPECT_EQ(
+        RaisedDescription([] { DeleteRegistryKey(kCurrentUser, "Software\\Gone", "Shared"); }),
+        "RegOpenKeyEx failure");
     EXPECT_EQ(RaisedDescription([] { DeleteRegistryKeyTree(kCurrentUser, "Software", "Gone"); }),
               "RegOpenKeyEx failure");
 }
@@ -231,8 +239,8 @@ TEST_F(LibRegistryTest, TreeDeletionTakesSubkeysAtIndexZeroDeepestFirst) {
     testsupport::ScopedStore scoped(std::move(recording));
 
     DeleteRegistryKeyTree(kCurrentUser, LibRegistryVTRShared::SharedKeyFullPath(""), "Network1");
-    EXPECT_THAT(store.calls, ElementsAre("enum 0", "enum 0", "delete Deep", "delete AuxA",
-                                         "enum 0", "delete AuxB", "delete Network1"));
+    EXPECT_THAT(store.calls, ElementsAre("enum 0", "enum 0", "delete Deep", "delete AuxA", "enum 0",
+                                         "delete AuxB", "delete Network1"));
     EXPECT_EQ(store.open, 0);
     EXPECT_EQ(LibRegistryVTRShared::GetSharedString("Comment", "Network1\\AuxA\\Deep", "gone"),
               "gone");

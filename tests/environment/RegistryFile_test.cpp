@@ -27,7 +27,8 @@ std::string Utf16(const std::string& text, bool byteOrderMark = true) {
         } else {
             cp = c & 0x07, length = 4;
         }
-        for (int k = 1; k < length; ++k) cp = cp << 6 | (text[i + k] & 0x3F);
+        for (int k = 1; k < length; ++k)
+            cp = cp << 6 | (text[i + k] & 0x3F);
         i += length;
         if (cp >= 0x10000) {
             put(0xD800 + ((cp - 0x10000) >> 10));
@@ -41,7 +42,8 @@ std::string Utf16(const std::string& text, bool byteOrderMark = true) {
 
 const Value* Find(const Document& document, const std::string& key, const std::string& name) {
     const Key* found = document.FindKey(SplitKeyPath(key));
-    if (found == nullptr) return nullptr;
+    if (found == nullptr)
+        return nullptr;
     auto value = found->values.find(Fold(name));
     return value == found->values.end() ? nullptr : &value->second.value;
 }
@@ -49,8 +51,10 @@ const Value* Find(const Document& document, const std::string& key, const std::s
 // The text of a string value (without its NUL), or "<none>".
 std::string Text(const Document& document, const std::string& key, const std::string& name) {
     const Value* value = Find(document, key, name);
-    if (value == nullptr) return "<none>";
-    if (value->type != RegistryStore::ValueType::String) return "<type " + std::to_string(value->type) + ">";
+    if (value == nullptr)
+        return "<none>";
+    if (value->type != RegistryStore::ValueType::String)
+        return "<type " + std::to_string(value->type) + ">";
     return value->data.substr(0, value->data.size() - 1);
 }
 
@@ -94,7 +98,8 @@ TEST(RegistryFile, ReadsAWindowsExportInUtf16) {
     EXPECT_EQ(expand->type, 2u);
     EXPECT_EQ(Text(document, "Software\\Vantori\\Shared\\NetVersion", "Ver"), "{1234}");
     // Names compare without regard to case; only the current user's root is read.
-    EXPECT_EQ(Text(document, "SOFTWARE\\vantori\\shared", "apppath"), "C:\\Program Files\\Vantori\\");
+    EXPECT_EQ(Text(document, "SOFTWARE\\vantori\\shared", "apppath"),
+              "C:\\Program Files\\Vantori\\");
     EXPECT_EQ(document.FindKey(SplitKeyPath("Software\\Vantori"))->subkeys.size(), 1u);
     EXPECT_EQ(document.Root().subkeys.size(), 1u);
 }
@@ -143,9 +148,9 @@ TEST(RegistryFile, ReadsUtf8AndTheOlderHeaderAndKeepsTheirForm) {
         Document document = Document::Parse(bom + text);
         ASSERT_TRUE(document.Understood());
         EXPECT_EQ(Text(document, kShared, "AppPath"), "/opt/vantori");
-        ASSERT_EQ(document.SetValue(SplitKeyPath(kShared), "MediaDataPath",
-                                    Value::String("/srv/media")),
-                  Code::Success);
+        ASSERT_EQ(
+            document.SetValue(SplitKeyPath(kShared), "MediaDataPath", Value::String("/srv/media")),
+            Code::Success);
         EXPECT_EQ(*document.Serialize(), bom + text + "\"MediaDataPath\"=\"/srv/media\"\n");
     }
     // UTF-16 without a byte-order mark is recognised and written back without one.
@@ -153,7 +158,8 @@ TEST(RegistryFile, ReadsUtf8AndTheOlderHeaderAndKeepsTheirForm) {
     ASSERT_TRUE(bare.Understood());
     EXPECT_EQ(Text(bare, kShared, "AppPath"), "/opt/vantori");
     ASSERT_EQ(bare.SetValue(SplitKeyPath(kShared), "AppPath", Value::String("/x")), Code::Success);
-    EXPECT_EQ(*bare.Serialize(), Utf16("REGEDIT4\n\n[HKCU\\Software\\Vantori\\Shared]\n\"AppPath\"=\"/x\"\n", false));
+    EXPECT_EQ(*bare.Serialize(),
+              Utf16("REGEDIT4\n\n[HKCU\\Software\\Vantori\\Shared]\n\"AppPath\"=\"/x\"\n", false));
 }
 
 TEST(RegistryFile, RemovalsApplyInFileOrder) {
@@ -296,12 +302,14 @@ TEST(RegistryFile, ATextThatIsNotARegistryExportIsReadAsEmptyAndNeverChanged) {
     Document empty = Document::Parse("");
     EXPECT_TRUE(empty.Understood());
     ASSERT_EQ(empty.SetValue(SplitKeyPath(""), "V", Value::Dword(1)), Code::Success);
-    EXPECT_EQ(*empty.Serialize(),
-              "Windows Registry Editor Version 5.00\n\n[HKEY_CURRENT_USER]\n\"V\"=dword:00000001\n");
+    EXPECT_EQ(
+        *empty.Serialize(),
+        "Windows Registry Editor Version 5.00\n\n[HKEY_CURRENT_USER]\n\"V\"=dword:00000001\n");
 }
 
 TEST(RegistryFile, AStringTheFileCannotHoldIsRefused) {
-    Document document = Document::Parse(Utf16("Windows Registry Editor Version 5.00\r\n\r\n[HKCU\\K]\r\n"));
+    Document document =
+        Document::Parse(Utf16("Windows Registry Editor Version 5.00\r\n\r\n[HKCU\\K]\r\n"));
     const std::string before = *document.Serialize();
     EXPECT_EQ(document.SetValue(SplitKeyPath("K"), "Bad", Value::String("\xFF\xFE not UTF-8")),
               Code::InvalidData);

@@ -32,7 +32,8 @@ std::vector<std::string> Leftovers(const std::string& folder, const std::string&
     std::vector<std::string> names;
     for (const auto& entry : fs::directory_iterator(folder)) {
         const std::string name = entry.path().filename().string();
-        if (name != storeName && name != "tmp") names.push_back(name);
+        if (name != storeName && name != "tmp")
+            names.push_back(name);
     }
     return names;
 }
@@ -98,7 +99,8 @@ TEST_F(RegistryStoreTest, AnExportReadChangedAndWrittenBackDiffersOnlyInTheChang
     const std::string text = BulkStore(3);
     auto utf16 = [](const std::string& ascii) {
         std::string bytes = "\xFF\xFE";
-        for (char c : ascii) bytes += std::string{c, '\0'};
+        for (char c : ascii)
+            bytes += std::string{c, '\0'};
         return bytes;
     };
     WriteStore(utf16(text));
@@ -188,7 +190,8 @@ TEST_F(RegistryStoreTest, AWriterKilledAtAnyMomentLeavesTheOldOrTheNewStore) {
     const std::string original = BulkStore(300);  // large enough for a write to take a while
     WriteStore(original);
     const RegistryFile::Document before = RegistryFile::Document::Parse(original);
-    const RegistryFile::KeyPath network = RegistryFile::SplitKeyPath("Software\\Vantori\\Shared\\Network");
+    const RegistryFile::KeyPath network =
+        RegistryFile::SplitKeyPath("Software\\Vantori\\Shared\\Network");
 
     std::mt19937 random(12345);
     int lastSeen = -1;
@@ -197,9 +200,8 @@ TEST_F(RegistryStoreTest, AWriterKilledAtAnyMomentLeavesTheOldOrTheNewStore) {
         ASSERT_GE(child, 0);
         if (child == 0) {
             for (int i = 0;; ++i) {
-                ResumeStep([&] {
-                    SetSharedString("Counter", std::to_string(round * 100000 + i), "");
-                });
+                ResumeStep(
+                    [&] { SetSharedString("Counter", std::to_string(round * 100000 + i), ""); });
             }
         }
         std::this_thread::sleep_for(std::chrono::microseconds(2000 + random() % 20000));

@@ -28,7 +28,8 @@ TempFolder::TempFolder() {
     }
 #else
     std::string pattern = (base / "vtr-test-XXXXXX").string();
-    if (::mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("mkdtemp failed");
+    if (::mkdtemp(pattern.data()) == nullptr)
+        throw std::runtime_error("mkdtemp failed");
     path_ = pattern;
 #endif
 }
@@ -74,11 +75,14 @@ void SetVariable(const std::string& name, const std::optional<std::string>& valu
 ScopedEnvironment::ScopedEnvironment(const std::string& name,
                                      const std::optional<std::string>& value)
     : name_(name) {
-    if (const char* old = std::getenv(name.c_str())) previous_ = old;
+    if (const char* old = std::getenv(name.c_str()))
+        previous_ = old;
     SetVariable(name_, value);
 }
 
-ScopedEnvironment::~ScopedEnvironment() { SetVariable(name_, previous_); }
+ScopedEnvironment::~ScopedEnvironment() {
+    SetVariable(name_, previous_);
+}
 
 std::string ReadFileBytes(const std::string& path) {
     std::ifstream in(path, std::ios::binary);
@@ -88,7 +92,8 @@ std::string ReadFileBytes(const std::string& path) {
 void WriteFileBytes(const std::string& path, const std::string& bytes) {
     std::ofstream out(path, std::ios::binary | std::ios::trunc);
     out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
-    if (!out) throw std::runtime_error("cannot write " + path);
+    if (!out)
+        throw std::runtime_error("cannot write " + path);
 }
 
 StoreTest::StoreTest()

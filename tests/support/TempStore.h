@@ -21,7 +21,7 @@ namespace vtr::testsupport {
 
 // A new folder under the system's temporary folder, removed with its content at the end.
 class TempFolder {
-public:
+  public:
     TempFolder();
     ~TempFolder();
     TempFolder(const TempFolder&) = delete;
@@ -31,7 +31,7 @@ public:
     // The path of a name inside the folder (nothing is created).
     std::string File(const std::string& name) const;
 
-private:
+  private:
     std::string path_;
 };
 
@@ -39,7 +39,7 @@ private:
 // store that was in place back afterwards. The suite's cached folders (VTRCommon) are
 // forgotten on both ends, so nothing read from one store leaks into the next test.
 class ScopedStore {
-public:
+  public:
     explicit ScopedStore(const std::string& file);
     // Any store of the test's own (a recording or failing one, say).
     explicit ScopedStore(std::unique_ptr<RegistryStore::Backend> backend);
@@ -47,19 +47,19 @@ public:
     ScopedStore(const ScopedStore&) = delete;
     ScopedStore& operator=(const ScopedStore&) = delete;
 
-private:
+  private:
     std::unique_ptr<RegistryStore::Backend> previous_;
 };
 
 // Sets an environment variable (or unsets it, with nothing) for as long as the object lives.
 class ScopedEnvironment {
-public:
+  public:
     ScopedEnvironment(const std::string& name, const std::optional<std::string>& value);
     ~ScopedEnvironment();
     ScopedEnvironment(const ScopedEnvironment&) = delete;
     ScopedEnvironment& operator=(const ScopedEnvironment&) = delete;
 
-private:
+  private:
     std::string name_;
     std::optional<std::string> previous_;
 };
@@ -72,7 +72,7 @@ void WriteFileBytes(const std::string& path, const std::string& bytes);
 // written: an empty store) selected for the test, and TMPDIR pointing into the folder so
 // that temporary files land there too.
 class StoreTest : public ::testing::Test {
-protected:
+  protected:
     StoreTest();
 
     const std::string& StoreFile() const { return storeFile_; }
@@ -83,7 +83,7 @@ protected:
 
     TempFolder folder_;
 
-private:
+  private:
     std::string storeFile_;
     ScopedStore store_;
     ScopedEnvironment tmpdir_;
