@@ -36,9 +36,8 @@ class FileStore final : public Backend {
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(parent, path, unreadable))
+        if (Status status = Resolve(parent, subKey, path, unreadable))
             return status;
-        Append(path, subKey);
         const std::shared_ptr<const Document> document = Snapshot();
         if (unreadable || !document->Understood()) {
             // Whether the key exists cannot be told. A key opened for changes is handed out
@@ -58,9 +57,8 @@ class FileStore final : public Backend {
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(parent, path, unreadable))
+        if (Status status = Resolve(parent, subKey, path, unreadable))
             return status;
-        Append(path, subKey);
         if (Status status = Change([&](Document& d) { return d.CreateKey(path); })) {
             return status;
         }
@@ -146,12 +144,10 @@ class FileStore final : public Backend {
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable))
-            return status;
-        const KeyPath names = RegistryFile::SplitKeyPath(subKey);
-        if (names.empty())
+        if (RegistryFile::SplitKeyPath(subKey).empty())
             return Code::AccessDenied;
-        path.insert(path.end(), names.begin(), names.end());
+        if (Status status = Resolve(key, subKey, path, unreadable))
+            return status;
         return Change([&](Document& d) { return d.DeleteKey(path); });
     }
 
@@ -161,11 +157,6 @@ class FileStore final : public Backend {
         bool unreadableStore = false;  // opened while the store could not be read
     };
 
-    static void Append(KeyPath& path, const std::string& subKey) {
-        const KeyPath names = RegistryFile::SplitKeyPath(subKey);
-        path.insert(path.end(), names.begin(), names.end());
-    }
-
     KeyHandle NewHandle(KeyPath path, bool unreadableStore) {
         const KeyHandle handle = nextHandle_;
         nextHandle_ += 4;
@@ -173,17 +164,20 @@ class FileStore final : public Backend {
         return handle;
     }
 
-    Status Resolve(KeyHandle key, KeyPath& path, bool& unreadableStore) const {
-        if (key == LibRegistry::kCurrentUser) {
-            path.clear();
-            unreadableStore = false;
-            return Code::Success;
+    // The path of the open key (the root included), followed by the names of subKey.
+    Status Resolve(KeyHandle key, const std::string& subKey, KeyPath& path,
+                   bool& unreadableStore) const {
+        path.clear();
+        unreadableStore = false;
+        if (key != LibRegistry::kCurrentUser) {
+            auto entry = handles_.find(key);
+            if (entry == handles_.end())
+                return Code::InvalidHandle;
+            path = entry->second.path;
+            unreadableStore = entry->second.unreadableStore;
         }
-        auto entry = handles_.find(key);
-        if (entry == handles_.end())
-            return Code::InvalidHandle;
-        path = entry->second.path;
-        unreadableStore = entry->second.unreadableStore;
+        const KeyPath names = RegistryFile::SplitKeyPath(subKey);
+        path.insert(path.end(), names.begin(), names.end());
         return Code::Success;
     }
 
@@ -192,7 +186,7 @@ class FileStore final : public Backend {
                        const RegistryFile::Key*& found) {
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable))
+        if (Status status = Resolve(key, {}, path, unreadable))
             return status;
         document = Snapshot();
         if (unreadable || !document->Understood())
@@ -237,7 +231,7 @@ class FileStore final : public Backend {
         std::lock_guard lock(mutex_);
         KeyPath path;
         bool unreadable = false;
-        if (Status status = Resolve(key, path, unreadable))
+        if (Status status = Resolve(key, {}, path, unreadable))
             return status;
         return Change([&](Document& d) { return d.SetValue(path, valueName, value); });
     }
