@@ -7,6 +7,7 @@
 
 #include "engine/ICheck.h"
 #include "engine/INotificationClient.h"
+#include "engine/Messages.h"
 #include "engine/OrderedStringSet.h"
 #include "engine/Result.h"
 
@@ -37,6 +38,8 @@ void PostTransientMessage(const std::string& message);
 // skipped without leaving a gap; at most nine details are taken.
 ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpContextId,
                     int32_t messageNumber, const std::vector<std::string>& details = {});
+// The same for a catalog entry: its severity, summary, help-context id and number.
+ResultPtr AddResult(const Message& message, const std::vector<std::string>& details = {});
 
 // True when the result's message number, or else its IgnoreKey, is in the ignore lists.
 // Never fails.
