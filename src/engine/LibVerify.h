@@ -7,8 +7,19 @@
 
 #include "engine/ICheck.h"
 #include "engine/INotificationClient.h"
+#include "engine/Messages.h"
 #include "engine/OrderedStringSet.h"
 #include "engine/Result.h"
+
+namespace vtr {
+class Show;
+class Schedule;
+class YearSchedule;
+class NetworkPreferences;
+namespace seqlib {
+class Sequence;
+}
+}  // namespace vtr
 
 // The verification driver: one state for the whole program. This header holds the
 // services that checks and front ends call; the run itself (targets, queue, caches)
@@ -37,6 +48,8 @@ void PostTransientMessage(const std::string& message);
 // skipped without leaving a gap; at most nine details are taken.
 ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpContextId,
                     int32_t messageNumber, const std::vector<std::string>& details = {});
+// The same for a catalog entry: its severity, summary, help-context id and number.
+ResultPtr AddResult(const Message& message, const std::vector<std::string>& details = {});
 
 // True when the result's message number, or else its IgnoreKey, is in the ignore lists.
 // Never fails.
@@ -54,5 +67,48 @@ void ClearResults();
 // The two in-memory ignore lists (loaded from the settings store at the start of a run).
 OrderedStringSet& IgnoredMessageNumbers();
 OrderedStringSet& IgnoredResultKeys();
+
+// --- Target selection (before each run) ---------------------------------------------------
+
+// Stores both names and drops any loaded schedules.
+void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile);
+// Wraps one show in a temporary weekly schedule ("VTRVer-WS-") and an empty calendar
+// schedule ("VTRVer-YS-"); raises error 37 when they cannot be written.
+void VerifyShowFile(const std::string& showFile);
+// Wraps one sequence in a temporary show ("VTRVer-Show-"), then verifies that show.
+void VerifySequenceFile(const std::string& sequenceFile);
+const std::string& VerifiedWeeklyScheduleFile();
+const std::string& VerifiedYearlyScheduleFile();
+
+// --- Running -------------------------------------------------------------------------------
+
+// Clears the collections, loads the network preferences and ignore lists, queues the root
+// checks. The first step of RunVerification; the window also calls it once at start-up.
+void BeginVerification();
+// Runs one whole verification on the caller's thread; ends with ChecksCompleted.
+void RunVerification();
+// Empties the queue and refuses new checks; the running check finishes.
+void CancelVerification();
+bool IsVerifying();
+bool IsCancelled();
+
+// --- Services for checks ---------------------------------------------------------------------
+
+// Queues a check unless cancelled or a check with the same identifier is queued or done.
+void AddCheck(CheckPtr check);
+// The sequence of that file, loaded once per run; nullptr when it cannot be loaded.
+std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName);
+// The show of that file, parsed once per run (failures are not kept); nullptr on failure.
+std::shared_ptr<Show> LoadShow(const std::string& fileName);
+// The network preferences, loaded afresh at the start of each run.
+NetworkPreferences& GetNetworkPreferences();
+// The schedules of the current target, loaded on first request in a run.
+std::shared_ptr<Schedule> GetSchedule();
+std::shared_ptr<YearSchedule> GetYearSchedule();
+
+// --- Summary ---------------------------------------------------------------------------------
+
+int32_t ChecksPerformedCount();
+int32_t ChecksRemainingCount();
 
 }  // namespace vtr::LibVerify

@@ -13,6 +13,9 @@ using KeyHandle = std::uintptr_t;
 // The only root the program uses: the current user's hive.
 inline constexpr RootKey kCurrentUser = 0x80000001u;
 
+// The number of the errors raised here; the description tells which operation failed.
+inline constexpr int32_t kRegistryErrorNumber = -2147221503;
+
 // Access masks, with the values of the Windows API.
 inline constexpr uint32_t kKeyRead = 0x20019;
 inline constexpr uint32_t kKeyWrite = 0x20006;

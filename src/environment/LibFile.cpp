@@ -1,0 +1,118 @@
+#include "environment/LibFile.h"
+
+#include <cstdlib>
+
+#include "engine/VtrError.h"
+
+#ifdef _WIN32
+#include <windows.h>
+#else
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#endif
+
+namespace vtr::LibFile {
+namespace {
+
+#ifdef _WIN32
+constexpr char kSeparator = '\\';
+#else
+constexpr char kSeparator = '/';
+#endif
+
+constexpr const char* kTempSource = "LibFile.MakeTempFileName";
+
+}  // namespace
+
+std::string AddTrailingBackslash(const std::string& path) {
+    if (path.empty() || path.back() == '\\' || path.back() == '/')
+        return path;
+    return path + kSeparator;
+}
+
+#ifdef _WIN32
+
+bool DirectoryExists(const std::string& path) {
+    const DWORD attributes = GetFileAttributesA(path.c_str());
+    return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY) != 0;
+}
+
+bool FileExists(const std::string& path) {
+    const DWORD attributes = GetFileAttributesA(path.c_str());
+    return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY) == 0;
+}
+
+std::string MakeTempFileName(const std::string& prefix) {
+    constexpr DWORD kBufferChars = 261;
+    std::string folder(kBufferChars, ' ');
+    const DWORD length = GetTempPathA(kBufferChars, folder.data());
+    if (length == 0) {
+        Raise(ErrorNumbers::UserMessage, kTempSource,
+              "Cannot get temp path, error " + std::to_string(GetLastError()));
+    }
+    if (length >= kBufferChars) {
+        Raise(ErrorNumbers::UserMessage, kTempSource,
+              "Unexpected length of temp path, " + std::to_string(length));
+    }
+    folder.resize(length);
+    // The system's own unique-name service keeps only three characters of a prefix; the
+    // whole prefix is kept here, with a unique number after it, and the file is created
+    // exclusively so that no other process can have it.
+    static unsigned counter = 0;
+    for (int attempt = 0; attempt < 1000; ++attempt) {
+        const unsigned unique = (GetCurrentProcessId() * 2654435761u) ^
+                                static_cast<unsigned>(GetTickCount64()) ^ (++counter * 40503u);
+        char number[16];
+        wsprintfA(number, "%08X", unique);
+        const std::string name = folder + prefix + number + ".tmp";
+        HANDLE file = CreateFileA(name.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_NEW,
+                                  FILE_ATTRIBUTE_NORMAL, nullptr);
+        if (file != INVALID_HANDLE_VALUE) {
+            CloseHandle(file);
+            return name;
+        }
+        const DWORD error = GetLastError();
+        if (error != ERROR_FILE_EXISTS && error != ERROR_ALREADY_EXISTS) {
+            Raise(ErrorNumbers::UserMessage, kTempSource,
+                  "Cannot get temp file, error " + std::to_string(error));
+        }
+    }
+    Raise(ErrorNumbers::UserMessage, kTempSource,
+          "Cannot get temp file, error " + std::to_string(ERROR_FILE_EXISTS));
+}
+
+#else
+
+bool DirectoryExists(const std::string& path) {
+    struct stat status;
+    return ::stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode);
+}
+
+bool FileExists(const std::string& path) {
+    struct stat status;
+    return ::stat(path.c_str(), &status) == 0 && !S_ISDIR(status.st_mode);
+}
+
+std::string MakeTempFileName(const std::string& prefix) {
+    const char* configured = std::getenv("TMPDIR");
+    const std::string folder =
+        AddTrailingBackslash(configured != nullptr && *configured != '\0' ? configured : "/tmp");
+    // The unique part comes after the prefix; the file is created exclusively, so no other
+    // process can be given the same name.
+    constexpr int kSuffixChars = 4;  // ".tmp"
+    std::string name = folder + prefix + "XXXXXX.tmp";
+    const int fd = ::mkstemps(name.data(), kSuffixChars);
+    if (fd < 0) {
+        Raise(ErrorNumbers::UserMessage, kTempSource,
+              "Cannot get temp file, error " + std::to_string(errno));
+    }
+    ::close(fd);
+    return name;
+}
+
+#endif
+
+}  // namespace vtr::LibFile

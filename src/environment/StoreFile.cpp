@@ -1,0 +1,339 @@
+#include "environment/StoreFile.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <system_error>
+
+#ifdef _WIN32
+#include <windows.h>
+#else
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#endif
+
+namespace vtr::StoreFile {
+namespace {
+
+namespace fs = std::filesystem;
+
+// Temporary files of a write are named ".<store file>.vtrtmp-" and six more characters.
+constexpr const char* kTempMarker = ".vtrtmp-";
+constexpr std::size_t kTempUniqueChars = 6;
+
+std::string FolderOf(const std::string& path) {
+    const fs::path folder = fs::path(path).parent_path();
+    return folder.empty() ? std::string(".") : folder.string();
+}
+
+std::string TempPrefix(const std::string& path) {
+    return "." + fs::path(path).filename().string() + kTempMarker;
+}
+
+// Removes what writers killed half way left behind. Every writer holds the folder lock while
+// its temporary file exists, so under the lock none of them belongs to a live writer.
+void RemoveStaleTemporaries(const std::string& path) {
+    const std::string prefix = TempPrefix(path);
+    std::error_code error;
+    for (fs::directory_iterator it(FolderOf(path), error), end; !error && it != end;
+         it.increment(error)) {
+        const std::string name = it->path().filename().string();
+        if (name.size() == prefix.size() + kTempUniqueChars &&
+            name.compare(0, prefix.size(), prefix) == 0) {
+            std::error_code ignored;
+            fs::remove(it->path(), ignored);
+        }
+    }
+}
+
+}  // namespace
+
+std::string WriteTarget(const std::string& path) {
+    std::error_code error;
+    if (fs::is_symlink(path, error)) {
+        const fs::path target = fs::weakly_canonical(path, error);
+        if (!error)
+            return target.string();
+    }
+    return path;
+}
+
+#ifdef _WIN32
+
+namespace {
+
+int64_t FileTimeValue(const FILETIME& time) {
+    return static_cast<int64_t>(static_cast<uint64_t>(time.dwHighDateTime) << 32 |
+                                time.dwLowDateTime);
+}
+
+Stamp StampOfHandle(HANDLE file) {
+    Stamp stamp;
+    BY_HANDLE_FILE_INFORMATION info;
+    if (GetFileInformationByHandle(file, &info)) {
+        stamp.exists = true;
+        stamp.device = info.dwVolumeSerialNumber;
+        stamp.inode = static_cast<uint64_t>(info.nFileIndexHigh) << 32 | info.nFileIndexLow;
+        stamp.size = static_cast<uint64_t>(info.nFileSizeHigh) << 32 | info.nFileSizeLow;
+        stamp.modified = FileTimeValue(info.ftLastWriteTime);
+        stamp.changed = FileTimeValue(info.ftCreationTime);
+    }
+    return stamp;
+}
+
+bool IsMissing(DWORD error) {
+    return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND;
+}
+
+// A name for the folder's lock that every process of the user derives alike.
+std::string MutexName(const std::string& folder) {
+    std::error_code error;
+    std::string absolute = fs::absolute(folder, error).string();
+    if (error)
+        absolute = folder;
+    uint64_t hash = 1469598103934665603ull;  // FNV-1a
+    for (char c : absolute) {
+        const char lower = (c >= 'A' && c <= 'Z') ? static_cast<char>(c - 'A' + 'a') : c;
+        hash = (hash ^ static_cast<unsigned char>(lower == '/' ? '\\' : lower)) * 1099511628211ull;
+    }
+    char name[64];
+    wsprintfA(name, "Local\\VantoriSettingsStore-%08lx%08lx",
+              static_cast<unsigned long>(hash >> 32),
+              static_cast<unsigned long>(hash & 0xFFFFFFFFu));
+    return name;
+}
+
+}  // namespace
+
+std::optional<Stamp> StampOf(const std::string& path) {
+    HANDLE file = CreateFileA(path.c_str(), FILE_READ_ATTRIBUTES,
+                              FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                              OPEN_EXISTING, FILE_FLAG_BACKUP_SEMANTICS, nullptr);
+    if (file == INVALID_HANDLE_VALUE) {
+        if (IsMissing(GetLastError()))
+            return Stamp{};
+        return std::nullopt;
+    }
+    const Stamp stamp = StampOfHandle(file);
+    CloseHandle(file);
+    if (!stamp.exists)
+        return std::nullopt;
+    return stamp;
+}
+
+ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
+    HANDLE file = CreateFileA(path.c_str(), GENERIC_READ,
+                              FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                              OPEN_EXISTING, FILE_ATTRIBUTE_NORMAL, nullptr);
+    if (file == INVALID_HANDLE_VALUE) {
+        return IsMissing(GetLastError()) ? ReadOutcome::Missing : ReadOutcome::Failed;
+    }
+    stamp = StampOfHandle(file);
+    bytes.clear();
+    bool ok = stamp.exists;
+    char buffer[65536];
+    while (ok) {
+        DWORD got = 0;
+        if (!ReadFile(file, buffer, sizeof buffer, &got, nullptr)) {
+            ok = false;
+        } else if (got == 0) {
+            break;
+        } else {
+            bytes.append(buffer, got);
+        }
+    }
+    CloseHandle(file);
+    return ok ? ReadOutcome::Read : ReadOutcome::Failed;
+}
+
+FolderLock::FolderLock(const std::string& storePath) {
+    const std::string folder = FolderOf(storePath);
+    std::error_code error;
+    fs::create_directories(folder, error);
+    mutex_ = CreateMutexA(nullptr, FALSE, MutexName(folder).c_str());
+    if (mutex_ == nullptr)
+        return;
+    const DWORD waited = WaitForSingleObject(static_cast<HANDLE>(mutex_), INFINITE);
+    // An abandoned lock (its holder died) is ours now; the store is whole either way.
+    held_ = waited == WAIT_OBJECT_0 || waited == WAIT_ABANDONED;
+}
+
+FolderLock::~FolderLock() {
+    if (mutex_ == nullptr)
+        return;
+    if (held_)
+        ReleaseMutex(static_cast<HANDLE>(mutex_));
+    CloseHandle(static_cast<HANDLE>(mutex_));
+}
+
+bool Replace(const std::string& path, const std::string& bytes) {
+    RemoveStaleTemporaries(path);
+    const std::string folder = FolderOf(path);
+    static const char kDigits[] = "0123456789abcdefghijklmnopqrstuvwxyz";
+    static unsigned counter = 0;
+    HANDLE file = INVALID_HANDLE_VALUE;
+    std::string temp;
+    for (int attempt = 0; attempt < 100 && file == INVALID_HANDLE_VALUE; ++attempt) {
+        unsigned long long seed = (static_cast<unsigned long long>(GetCurrentProcessId()) << 32) ^
+                                  GetTickCount64() ^ (++counter * 2654435761u);
+        std::string unique;
+        for (std::size_t i = 0; i < kTempUniqueChars; ++i, seed /= 36)
+            unique += kDigits[seed % 36];
+        temp = (fs::path(folder) / (TempPrefix(path) + unique)).string();
+        file = CreateFileA(temp.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_NEW,
+                           FILE_ATTRIBUTE_NORMAL, nullptr);
+        if (file == INVALID_HANDLE_VALUE && GetLastError() != ERROR_FILE_EXISTS)
+            return false;
+    }
+    if (file == INVALID_HANDLE_VALUE)
+        return false;
+    bool ok = true;
+    for (std::size_t done = 0; ok && done < bytes.size();) {
+        const DWORD chunk = static_cast<DWORD>(std::min<std::size_t>(bytes.size() - done, 1 << 20));
+        DWORD written = 0;
+        ok = WriteFile(file, bytes.data() + done, chunk, &written, nullptr) && written > 0;
+        done += written;
+    }
+    ok = ok && FlushFileBuffers(file);
+    ok = CloseHandle(file) && ok;
+    // A reader of another program may hold the old file open for a moment.
+    for (int attempt = 0; ok; ++attempt) {
+        if (MoveFileExA(temp.c_str(), path.c_str(),
+                        MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH)) {
+            return true;
+        }
+        if (attempt == 20)
+            ok = false;
+        Sleep(50);
+    }
+    DeleteFileA(temp.c_str());
+    return false;
+}
+
+#else  // POSIX
+
+namespace {
+
+Stamp StampOfStat(const struct stat& status) {
+    Stamp stamp;
+    stamp.exists = true;
+    stamp.device = static_cast<uint64_t>(status.st_dev);
+    stamp.inode = static_cast<uint64_t>(status.st_ino);
+    stamp.size = static_cast<uint64_t>(status.st_size);
+#ifdef __APPLE__
+    stamp.modified = status.st_mtimespec.tv_sec * 1000000000LL + status.st_mtimespec.tv_nsec;
+    stamp.changed = status.st_ctimespec.tv_sec * 1000000000LL + status.st_ctimespec.tv_nsec;
+#else
+    stamp.modified = status.st_mtim.tv_sec * 1000000000LL + status.st_mtim.tv_nsec;
+    stamp.changed = status.st_ctim.tv_sec * 1000000000LL + status.st_ctim.tv_nsec;
+#endif
+    return stamp;
+}
+
+bool WriteFully(int fd, const std::string& bytes) {
+    for (std::size_t done = 0; done < bytes.size();) {
+        const ssize_t written = ::write(fd, bytes.data() + done, bytes.size() - done);
+        if (written < 0) {
+            if (errno == EINTR)
+                continue;
+            return false;
+        }
+        done += static_cast<std::size_t>(written);
+    }
+    return true;
+}
+
+}  // namespace
+
+std::optional<Stamp> StampOf(const std::string& path) {
+    struct stat status;
+    if (::stat(path.c_str(), &status) != 0) {
+        if (errno == ENOENT || errno == ENOTDIR)
+            return Stamp{};
+        return std::nullopt;
+    }
+    return StampOfStat(status);
+}
+
+ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
+    const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    if (fd < 0) {
+        return errno == ENOENT || errno == ENOTDIR ? ReadOutcome::Missing : ReadOutcome::Failed;
+    }
+    struct stat status;
+    bool ok = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
+    if (ok) {
+        stamp = StampOfStat(status);
+        bytes.clear();
+        bytes.reserve(static_cast<std::size_t>(status.st_size));
+        char buffer[65536];
+        while (true) {
+            const ssize_t got = ::read(fd, buffer, sizeof buffer);
+            if (got < 0 && errno == EINTR)
+                continue;
+            if (got <= 0) {
+                ok = got == 0;
+                break;
+            }
+            bytes.append(buffer, static_cast<std::size_t>(got));
+        }
+    }
+    ::close(fd);
+    return ok ? ReadOutcome::Read : ReadOutcome::Failed;
+}
+
+FolderLock::FolderLock(const std::string& storePath) {
+    const std::string folder = FolderOf(storePath);
+    std::error_code error;
+    fs::create_directories(folder, error);
+    folder_ = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    if (folder_ < 0)
+        return;
+    int result;
+    do {
+        result = ::flock(folder_, LOCK_EX);
+    } while (result != 0 && errno == EINTR);
+    held_ = result == 0;
+}
+
+FolderLock::~FolderLock() {
+    // Closing the descriptor releases the lock.
+    if (folder_ >= 0)
+        ::close(folder_);
+}
+
+bool Replace(const std::string& path, const std::string& bytes) {
+    RemoveStaleTemporaries(path);
+    const std::string folder = FolderOf(path);
+    std::string temp =
+        (fs::path(folder) / (TempPrefix(path) + std::string(kTempUniqueChars, 'X'))).string();
+    const int fd = ::mkstemp(temp.data());
+    if (fd < 0)
+        return false;
+    ::fcntl(fd, F_SETFD, FD_CLOEXEC);
+    // The new version keeps the old one's permissions; a new store is private to the user.
+    struct stat old;
+    if (::stat(path.c_str(), &old) == 0)
+        ::fchmod(fd, old.st_mode & 07777);
+    bool ok = WriteFully(fd, bytes) && ::fsync(fd) == 0;
+    ok = ::close(fd) == 0 && ok;
+    ok = ok && ::rename(temp.c_str(), path.c_str()) == 0;
+    if (!ok) {
+        ::unlink(temp.c_str());
+        return false;
+    }
+    // Makes the rename itself durable.
+    const int directory = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    if (directory >= 0) {
+        ::fsync(directory);
+        ::close(directory);
+    }
+    return true;
+}
+
+#endif
+
+}  // namespace vtr::StoreFile
