@@ -115,7 +115,7 @@ std::string GetR9PlaybackFile(const std::string& sequenceFile) {
     if (!info)
         return {};
     if (info->ProblemCount() >= 1) {
-        LibVerify::AddResult(Severity::Error, "No Playback File Name", 0, 0, info->ProblemTexts());
+        LibVerify::AddResult(Messages::NoPlaybackFileName, info->ProblemTexts());
         return {};
     }
     return info->PlaybackFile();
