@@ -1,7 +1,7 @@
 #include "sequencelib/Sequence.h"
 
 #include <algorithm>
-#include <charconv>
+#include <cstdint>
 #include <cstring>
 #include <limits>
 #include <new>
@@ -240,11 +240,24 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
 
     int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
                   int64_t max) const {
+        // Digits, with a minus sign in front for a negative number; nothing else.
         const char* text = attribute.value();
-        const char* end = text + std::strlen(text);
+        const char* p = text;
+        const bool negative = *p == '-';
+        if (negative)
+            ++p;
         int64_t value = 0;
-        const auto [stop, error] = std::from_chars(text, end, value);
-        if (text == end || error != std::errc() || stop != end || value < min || value > max) {
+        bool valid = *p != '\0';
+        for (; *p != '\0'; ++p) {
+            if (*p < '0' || *p > '9' || value > (INT64_MAX - 9) / 10) {
+                valid = false;
+                break;
+            }
+            value = value * 10 + (*p - '0');
+        }
+        if (negative)
+            value = -value;
+        if (!valid || value < min || value > max) {
             Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + text +
                                 "\" of <" + element + "> is not a whole number from " +
                                 std::to_string(min) + " to " + std::to_string(max));

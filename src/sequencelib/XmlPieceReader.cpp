@@ -456,19 +456,6 @@ bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler) {
 
 std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const {
     std::string_view view(buffer_.get() + from, limit - from);
-    // Never past the end tag of the element whose content this is.
-    const std::string endTag = "</" + open_.back().name;
-    for (std::size_t at = 0;;) {
-        const std::size_t match = view.find(endTag, at);
-        if (match == std::string_view::npos)
-            break;
-        const std::size_t after = match + endTag.size();
-        if (after == view.size() || view[after] == '>' || IsSpace(view[after])) {
-            view = view.substr(0, match);
-            break;
-        }
-        at = match + 1;
-    }
     const std::string& child = open_.back().childName;
     if (!child.empty()) {
         // After the last end tag of the kind of child seen last.
@@ -489,7 +476,20 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
         }
         return npos;
     }
-    // After the last end tag or empty-element tag.
+    // After the last end tag or empty-element tag, but never past the end tag of the element
+    // whose content this is (a large element's last piece).
+    const std::string endTag = "</" + open_.back().name;
+    for (std::size_t at = 0;;) {
+        const std::size_t match = view.find(endTag, at);
+        if (match == std::string_view::npos)
+            break;
+        const std::size_t after = match + endTag.size();
+        if (after == view.size() || view[after] == '>' || IsSpace(view[after])) {
+            view = view.substr(0, match);
+            break;
+        }
+        at = match + 1;
+    }
     std::size_t end = view.size();
     for (int tries = 0; tries < 64 && end > 0; ++tries) {
         const std::size_t gt = view.rfind('>', end - 1);
