@@ -394,6 +394,9 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
             pos_ = cut.at;
             CheckEndTag(cut.tagStart, cut.tag);
             handler.LeaveElement();
+            // The parent's next guess looks for the end of a sibling of this kind.
+            if (open_.size() >= 2)
+                open_[open_.size() - 2].childName = std::move(open_.back().name);
             open_.pop_back();
             pos_ = cut.tag.end;
             break;
@@ -510,7 +513,7 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
 XmlPieceReader::Cut XmlPieceReader::ScanContent() {
     const std::size_t limit = pos_ + pieceBytes_;
     // An element that does not end within this much is entered rather than taken whole.
-    const std::size_t descendAt = pos_ + std::max<std::size_t>(pieceBytes_ / 8, 1);
+    const std::size_t descendAt = pos_ + std::max<std::size_t>(pieceBytes_ / 32, 1);
     std::size_t i = pos_;
     std::size_t lastCut = pos_;
     std::size_t firstTag = pos_;

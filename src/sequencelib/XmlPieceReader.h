@@ -37,13 +37,13 @@ class XmlPieceHandler {
 // Reads an XML document of any size while holding the parse tree of one piece of about
 // pieceBytes at a time. The document is cut between sibling nodes; each piece is parsed
 // by pugixml on its own, and the tags around the pieces (the document element and any
-// element that does not close within an eighth of a piece, which is entered rather than
+// element that does not close within a thirty-second of a piece, which is entered rather than
 // taken whole) are checked as they pass, so a document that is not well-formed is refused
 // with the place of the fault. Beyond what pugixml checks, the document must have one root
 // element with nothing but comments and processing instructions around it, an XML
 // declaration only at its start, a DOCTYPE only before the root and no NUL byte.
 //
-// A cut is first guessed: after the last end tag of the kind of child last seen whole, or
+// A cut is first guessed: after the last end tag of the kind of child last seen, or
 // else after the last end tag or empty-element tag before the current element's own end
 // tag. The guess holds exactly when the piece parses as complete nodes, since a parse that
 // starts between nodes reads the same bytes the same way whatever comes after them. When
