@@ -91,9 +91,9 @@ class XmlPieceReader {
     void Step(XmlPieceHandler& handler);
     void ReadEpilog();
 
-    bool TryGuessedPiece(XmlPieceHandler& handler);
-    std::size_t GuessCut(std::size_t from, std::size_t limit) const;
-    Cut ScanContent();
+    bool TryGuessedPiece(XmlPieceHandler& handler, bool& largeChildNext);
+    std::size_t GuessCut(std::size_t from, std::size_t limit, bool& largeChildNext) const;
+    Cut ScanContent(bool largeChildNext);
     bool ParsePiece(std::size_t from, std::size_t to, bool guessed);
     void HandlePiece(XmlPieceHandler& handler);
     pugi::xml_node ParseStartTag(std::size_t from, std::size_t tagStart, const Lexed& tag);
