@@ -7,6 +7,7 @@
 #include <regex>
 #include <set>
 
+#include "checks/CheckAppFileExists.h"
 #include "cli/DemoFixture.h"
 #include "engine/LibVerify.h"
 #include "environment/VTRCommon.h"
@@ -50,23 +51,139 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
     const Outcome outcome = Run({"--schedule"});
     EXPECT_EQ(outcome.status, 2);
     EXPECT_EQ(outcome.err, "");
-    EXPECT_THAT(outcome.out, StartsWith("Error 16: Application file has unexpected version number\n"
-                                        "    [FILE]: " +
-                                        Demo("app/SuiteTray.exe") +
-                                        "\n"
-                                        "    [EXPECTED]: 1.0.0.0\n"
-                                        "    [FOUND]: 0.9.4.2\n"));
-    EXPECT_THAT(outcome.out, HasSubstr("\nIgnored results:\n"
-                                       "Warning 6: Verifier not running from VTR application path\n"
-                                       "    [APPLICATION]: " +
-                                       Demo("app/") +
-                                       "\n"
-                                       "    [VERIFIER]: " +
-                                       VTRCommon::GetProgramFolder() + "\n"));
-    const std::regex summary(
-        "\n\n[0-9]+ checks performed, [0-9]+ errors?, [0-9]+ warnings?, "
-        "[0-9]+ ignored results?\\.\n$");
-    EXPECT_TRUE(std::regex_search(outcome.out, summary)) << outcome.out;
+    const std::string sequences = Demo("data/sequences/");
+    const std::string shows = Demo("data/shows/");
+    EXPECT_EQ(outcome.out,
+              "Error 16: Application file has unexpected version number\n"
+              "    [FILE]: " +
+                  Demo("app/SuiteTray.exe") +
+                  "\n"
+                  "    [EXPECTED]: 1.0.0.0\n"
+                  "    [FOUND]: 0.9.4.2\n"
+                  "Warning 33: Musical file used in non-audio section of show\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Carol.lms\n"
+                  "    [SHOW]: " +
+                  shows +
+                  "Weekend.lss\n"
+                  "    [SECTION]: background\n"
+                  "Error 23: Sequence file does not exist\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Fireworks.las\n"
+                  "    [SHOW]: show " +
+                  shows +
+                  "Weekend.lss\n"
+                  "Warning 43: Channel conflict\n"
+                  "    [SHOW]: " +
+                  shows +
+                  "Evening.lss\n"
+                  "    [SECTION]: Musical\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Carol.lms\n"
+                  "    [TRACK]: Track 1: Tree\n"
+                  "    [CHANNEL]: Tree\n"
+                  "    [SECTION]: Background\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Twinkle.las\n"
+                  "    [TRACK]: Track 2: Tree\n"
+                  "    [CHANNEL]: Tree\n"
+                  "Warning 28: Channel is completely off\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Snowfall.las\n"
+                  "    [TRACK]: Track 1: Garage\n"
+                  "    [CHANNEL]: Star\n"
+                  "Warning 31: Channel uses undefined comm network\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Goodnight.las\n"
+                  "    [TRACK]: Track 1: Drive\n"
+                  "    [CHANNEL]: Driveway\n"
+                  "Error 26: Media file does not exist\n"
+                  "    [FILE]: " +
+                  Demo("media/Jingle.mp3") +
+                  "\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Jingle.lms\n"
+                  "\n"
+                  "Ignored results:\n"
+                  "Warning 6: Verifier not running from VTR application path\n"
+                  "    [APPLICATION]: " +
+                  Demo("app/") +
+                  "\n"
+                  "    [VERIFIER]: " +
+                  VTRCommon::GetProgramFolder() +
+                  "\n"
+                  "Warning 30: Channel is missing settings\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Intro.las\n"
+                  "    [TRACK]: Track 1: Porch\n"
+                  "    [CHANNEL]: Sparkle\n"
+                  "\n"
+                  "141 checks performed, 3 errors, 4 warnings, 2 ignored results.\n");
+}
+
+TEST_F(VerifyDemoTest, TheCalendarShowIsVerifiedUntilItsDatesHavePassed) {
+    EXPECT_THAT(
+        Run({"--schedule", "--log"}).err,
+        HasSubstr("Checking: Show file existence: " + Demo("data/shows/Holiday.lss") + "\n"));
+    // 201 days on, both of the Holiday show's dates lie in the past.
+    ScopedNowSource later([] { return Now().AddDays(201); });
+    const Outcome outcome = Run({"--schedule", "--log"});
+    EXPECT_THAT(outcome.err, Not(HasSubstr("Holiday.lss")));
+    EXPECT_EQ(outcome.status, 2);
+}
+
+TEST_F(VerifyDemoTest, EachTargetFindsItsOwnShareOfTheDemo) {
+    struct Case {
+        std::vector<std::string> target;
+        std::vector<std::string> findings;
+        int status;
+    };
+    const std::vector<Case> cases = {
+        {{"--show", Demo("data/shows/Evening.lss")},
+         {"W6 ignored", "E16", "W43", "W30 ignored", "W28", "E26", "W31"},
+         2},
+        {{"--show", Demo("data/shows/Weekend.lss")},
+         {"W6 ignored", "E16", "W33", "E23", "W30 ignored", "W28", "W31"},
+         2},
+        {{"--sequence", Demo("data/sequences/Snowfall.las")}, {"W6 ignored", "E16", "W28"}, 2},
+        {{"--sequence", Demo("data/sequences/Bells.vtredit")}, {"W6 ignored", "E16"}, 2},
+    };
+    for (const Case& c : cases) {
+        std::vector<std::string> arguments = c.target;
+        arguments.insert(arguments.end(), {"--format", "json"});
+        const Outcome outcome = Run(arguments);
+        EXPECT_EQ(outcome.status, c.status) << c.target[1];
+        EXPECT_EQ(Findings(nlohmann::json::parse(outcome.out)), c.findings) << c.target[1];
+    }
+
+    // Without the wrong application file only the sequence's own warning is left.
+    testsupport::WritePeImage(Demo("app/SuiteTray.exe"), DefaultExpectedVersion());
+    Outcome outcome = Run({"--sequence", Demo("data/sequences/Snowfall.las")});
+    EXPECT_EQ(outcome.status, 1);
+    outcome = Run({"--sequence", Demo("data/sequences/Sparkle.las")});
+    EXPECT_EQ(outcome.status, 0);
+    EXPECT_THAT(outcome.out, StartsWith("Info 1: No errors or warnings found\n"));
+}
+
+TEST_F(VerifyDemoTest, ARelativeTargetIsNamedByItsAbsolutePath) {
+    std::error_code error;
+    const fs::path previous = fs::current_path();
+    fs::current_path(Demo("data"));
+    const Outcome outcome =
+        Run({"--sequence", "./sequences/../sequences/Intro.las", "--format", "json"});
+    fs::current_path(previous, error);
+    const nlohmann::json document = nlohmann::json::parse(outcome.out);
+    EXPECT_EQ(document["target"]["file"], Demo("data/sequences/Intro.las"));
+    // So the demo's ignored result matches, as it does for the schedule.
+    EXPECT_THAT(Findings(document), ::testing::Contains("W30 ignored"));
 }
 
 TEST_F(VerifyDemoTest, JsonAgreesWithTheTextAndTheDriversCounts) {
