@@ -16,8 +16,6 @@
 namespace vtr::MediaPlayerProbe {
 namespace {
 
-constexpr const char* kSource = "MediaPlayerProbe.VersionText";
-
 std::vector<std::string> Split(const std::string& text, char separator) {
     std::vector<std::string> parts;
     std::string::size_type start = 0;
@@ -66,6 +64,8 @@ class ComApartment {
   private:
     HRESULT result_;
 };
+
+constexpr const char* kSource = "MediaPlayerProbe.VersionText";
 
 [[noreturn]] void RaiseComFailure(const char* step, HRESULT result) {
     char code[16];
