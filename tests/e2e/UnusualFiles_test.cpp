@@ -112,7 +112,23 @@ TEST_F(UnusualFiles, WholeFilesAreOnlyReadFromFilesTheSuiteCouldHaveWritten) {
     }
 }
 
-TEST_F(UnusualFiles, VerifyingAPipeAsShowEndsWithItsFindings) {
+TEST_F(UnusualFiles, ASequenceOrEditFileThatIsNoFileFailsToLoadAtOnce) {
+    for (const std::string& path : {pipe_, device_}) {
+        WithoutWaitingOn(pipe_, [&] {
+            try {
+                seqlib::Sequence().Load(path);
+                ADD_FAILURE() << "loaded " << path;
+            } catch (const VtrError& error) {
+                EXPECT_EQ(error.Description(),
+                          "Cannot load sequence file \"" + path +
+                              "\": the file cannot be read (it is not a regular file)");
+            }
+            EXPECT_FALSE(seqlib::SequenceInfoService().GetSequenceInfo(path)) << path;
+        });
+    }
+}
+
+TEST_F(UnusualFiles, VerifyingAPipeAsShowOrSequenceEndsWithItsFindings) {
     InstallApplicationFiles();
     WithoutWaitingOn(pipe_, [&] {
         LibVerify::VerifyShowFile(pipe_);
@@ -120,6 +136,14 @@ TEST_F(UnusualFiles, VerifyingAPipeAsShowEndsWithItsFindings) {
     });
     EXPECT_EQ(client.log.back(), "ChecksCompleted false");
     EXPECT_THAT(testsupport::ResultTexts(), Contains("22: " + pipe_));
+
+    client.Clear();
+    WithoutWaitingOn(pipe_, [&] {
+        LibVerify::VerifySequenceFile(pipe_);
+        LibVerify::RunVerification();
+    });
+    EXPECT_EQ(client.log.back(), "ChecksCompleted false");
+    EXPECT_THAT(testsupport::ResultTexts(), Contains("24: " + pipe_));
 }
 
 #endif  // !_WIN32
