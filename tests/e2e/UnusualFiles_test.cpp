@@ -128,6 +128,19 @@ TEST_F(UnusualFiles, ASequenceOrEditFileThatIsNoFileFailsToLoadAtOnce) {
     }
 }
 
+TEST_F(UnusualFiles, ASettingsStoreThatIsAPipeReadsAsUnreadableAndIsNeverReplaced) {
+    testsupport::ScopedStore store(pipe_);
+    WithoutWaitingOn(pipe_, [&] {
+        EXPECT_EQ(LibRegistry::GetRegString(LibRegistry::kCurrentUser, "Software\\Vantori\\Shared",
+                                            "AppPath", "default"),
+                  "default");
+        EXPECT_THROW(LibRegistry::SetRegString(LibRegistry::kCurrentUser,
+                                               "Software\\Vantori\\Verifier", "IgnoreMsg1", "x"),
+                     VtrError);
+    });
+    EXPECT_TRUE(fs::is_fifo(pipe_));
+}
+
 TEST_F(UnusualFiles, VerifyingAPipeAsShowOrSequenceEndsWithItsFindings) {
     InstallApplicationFiles();
     WithoutWaitingOn(pipe_, [&] {
