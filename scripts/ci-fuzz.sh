@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # CI job: builds every fuzz target with clang, AddressSanitizer and UndefinedBehaviorSanitizer
 # (build-fuzz, or $VTR_FUZZ_BUILD_DIR) and runs each for a bounded time ($VTR_FUZZ_SECONDS,
-# 30 by default) from its seed corpus. A crash, a broken property, a leak, an input that
+# 30 by default) from its seed corpus, as many at a time as there are processors
+# ($VTR_FUZZ_JOBS). A crash, a broken property, a leak, an input that
 # takes over a second or one that makes a reader ask for absurd memory fails the job; the
 # input is kept in fuzz/artifacts/<target>/ of the build folder. One target alone:
 #   scripts/ci-fuzz.sh sequence
@@ -39,41 +40,59 @@ if command -v llvm-symbolizer >/dev/null 2>&1; then
 fi
 
 work=$build/fuzz
-summary=()
-failed=()
-for target in "${targets[@]}"; do
-    corpus=$work/corpus/$target
-    artifacts=$work/artifacts/$target
-    scratch=$work/tmp/$target
-    log=$work/logs/$target.log
+jobs=${VTR_FUZZ_JOBS:-$(nproc)}
+
+# Runs one target; its outcome goes to results/<target>: "ok <line>" or "failed <line>".
+run_target() {
+    local target=$1
+    local corpus=$work/corpus/$target artifacts=$work/artifacts/$target
+    local scratch=$work/tmp/$target log=$work/logs/$target.log result=$work/results/$target
     rm -rf "$artifacts" "$scratch"
-    mkdir -p "$corpus" "$artifacts" "$scratch" "$(dirname "$log")"
-    echo "--- fuzz_$target for ${seconds}s"
-    status=0
+    mkdir -p "$corpus" "$artifacts" "$scratch" "$work/logs" "$work/results"
+    local status=0
     # The readers that need a file write it into a folder of their own below TMPDIR.
     TMPDIR=$scratch "$work/fuzz_$target" "$corpus" "$work/seeds/$target" \
         -max_total_time="$seconds" -timeout=1 -rss_limit_mb=1024 -malloc_limit_mb=256 \
         -max_len="$(max_len "$target")" -print_final_stats=1 \
         -artifact_prefix="$artifacts/" >"$log" 2>&1 || status=$?
+    local runs inputs leftovers line
     runs=$(sed -n 's/^stat::number_of_executed_units: *//p' "$log" | tail -n 1)
     inputs=$(find "$corpus" -type f | wc -l)
-    line=$(printf '%-20s %10s runs %6s inputs kept' "$target" "${runs:-?}" "$inputs")
-    if [ "$status" -ne 0 ]; then
-        failed+=("$target")
-        line="$line  FAILED (status $status)"
-        tail -n 60 "$log"
-    fi
-    summary+=("$line")
     leftovers=$(find "$scratch" -mindepth 1 | wc -l)
-    if [ "$status" -eq 0 ] && [ "$leftovers" -ne 0 ]; then
-        failed+=("$target")
-        summary+=("$target left $leftovers files in its temporary folder")
+    line=$(printf '%-20s %10s runs %6s inputs in the corpus' "$target" "${runs:-?}" "$inputs")
+    if [ "$status" -ne 0 ]; then
+        echo "failed $line: status $status, see $log" >"$result"
+    elif [ "$leftovers" -ne 0 ]; then
+        echo "failed $line: $leftovers files left in its temporary folder" >"$result"
+    else
+        echo "ok $line" >"$result"
     fi
+}
+
+rm -rf "$work/results"
+echo "--- fuzzing ${#targets[@]} targets for ${seconds}s each, $jobs at a time"
+running=0
+for target in "${targets[@]}"; do
+    if [ "$running" -ge "$jobs" ]; then
+        wait -n || true
+        running=$((running - 1))
+    fi
+    run_target "$target" &
+    running=$((running + 1))
 done
+wait
 
 echo
 echo "=== fuzzing, ${seconds}s a target"
-printf '%s\n' "${summary[@]}"
+failed=()
+for target in "${targets[@]}"; do
+    result=$(cat "$work/results/$target" 2>/dev/null || echo "failed $target: no outcome")
+    echo "${result#* }"
+    if [ "${result%% *}" != ok ]; then
+        failed+=("$target")
+        tail -n 60 "$work/logs/$target.log" 2>/dev/null || true
+    fi
+done
 if [ ${#failed[@]} -ne 0 ]; then
     echo "failed: ${failed[*]} (inputs in $work/artifacts/)"
     exit 1
