@@ -318,14 +318,37 @@ TEST_P(SettingsStoreCrash, KilledWritersLeaveAWholeStoreAndLoseNoConfirmedChange
         readers.push_back(StartReader(kind, stop, results[static_cast<std::size_t>(kind)]));
     ::close(stop[0]);
 
-    // Rounds of two writers at once, each killed after its own random time: before it
-    // started, while it waits for the lock, in the middle of a write or between writes.
-    std::mt19937 random(20310314);
-    std::uniform_int_distribution<int> delay(0, 60000);  // microseconds
+    // How long a writer takes to start and make three writes, here and now (a build with
+    // sanitizers, a busy machine): the kills below fall within twice that.
     int64_t confirmed[2] = {0, 0};
+    std::chrono::microseconds threeWrites{0};
+    {
+        int report[2];
+        ASSERT_EQ(::pipe(report), 0);
+        const auto start = std::chrono::steady_clock::now();
+        const pid_t writer = StartWriter('A', report[1], 3);
+        ::close(report[1]);
+        const int status = WaitFor(writer);
+        threeWrites = std::chrono::duration_cast<std::chrono::microseconds>(
+            std::chrono::steady_clock::now() - start);
+        ASSERT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+        confirmed[0] = LastReported(ReadToEnd(report[0]), 0);
+        ::close(report[0]);
+        ASSERT_EQ(confirmed[0], 3);
+    }
+
+    // Rounds of two writers at once, each killed after its own random time: before it
+    // started, while it waits for the lock, in the middle of a write or between writes. At
+    // least 24 rounds, and more (up to 120) until each writer has finished a write and some
+    // kill has landed in the middle of replacing the file: otherwise the test proves nothing.
+    std::mt19937 random(20310314);
+    std::uniform_int_distribution<int64_t> delay(0, 2 * threeWrites.count());
     int leftBehind = 0;
-    constexpr int kRounds = 24;
-    for (int round = 0; round < kRounds; ++round) {
+    const int64_t before[2] = {confirmed[0], confirmed[1]};
+    auto enough = [&] {
+        return leftBehind > 0 && confirmed[0] > before[0] && confirmed[1] > before[1];
+    };
+    for (int round = 0; round < 120 && (round < 24 || !enough()); ++round) {
         int reports[2][2];
         pid_t writers[2];
         for (int i = 0; i < 2; ++i) {
@@ -333,8 +356,8 @@ TEST_P(SettingsStoreCrash, KilledWritersLeaveAWholeStoreAndLoseNoConfirmedChange
             writers[i] = StartWriter(kWriters[i], reports[i][1], 1000);
             ::close(reports[i][1]);
         }
-        const int first = delay(random);
-        const int second = delay(random);
+        const int64_t first = delay(random);
+        const int64_t second = delay(random);
         std::this_thread::sleep_for(std::chrono::microseconds(std::min(first, second)));
         ::kill(writers[first <= second ? 0 : 1], SIGKILL);
         std::this_thread::sleep_for(std::chrono::microseconds(std::abs(first - second)));
@@ -362,11 +385,8 @@ TEST_P(SettingsStoreCrash, KilledWritersLeaveAWholeStoreAndLoseNoConfirmedChange
                 ++leftBehind;
         }
     }
-    // Writes did finish, and kills did land in the middle of them (a fifth of them or so
-    // do): otherwise the test proves nothing.
-    EXPECT_GT(confirmed[0], 0);
-    EXPECT_GT(confirmed[1], 0);
-    EXPECT_GT(leftBehind, 0);
+    EXPECT_TRUE(enough()) << "writes finished: " << confirmed[0] - before[0] << " and "
+                          << confirmed[1] - before[1] << ", kills in a write: " << leftBehind;
 
     // Writers that run to the end: their changes land, and nothing of the killed ones stays.
     for (int i = 0; i < 2; ++i) {
@@ -391,8 +411,9 @@ TEST_P(SettingsStoreCrash, KilledWritersLeaveAWholeStoreAndLoseNoConfirmedChange
         EXPECT_GT(reads, 10) << outcome;
         EXPECT_GT(changes, 1) << outcome;
     }
-    EXPECT_EQ(testsupport::ReadFileBytes(storePath_),
-              StoreBytes(GetParam(), confirmed[0], confirmed[1]));
+    const std::string final = testsupport::ReadFileBytes(storePath_);
+    EXPECT_EQ(VersionOf(GetParam(), final), std::make_pair(confirmed[0], confirmed[1]));
+    EXPECT_TRUE(final == StoreBytes(GetParam(), confirmed[0], confirmed[1]));
     std::vector<std::string> names;
     for (const auto& entry : fs::directory_iterator(storeFolder_))
         names.push_back(entry.path().filename().string());
