@@ -1,0 +1,475 @@
+#include "sequencelib/Sequence.h"
+
+#include <algorithm>
+#include <charconv>
+#include <cstring>
+#include <limits>
+#include <new>
+#include <string_view>
+#include <unordered_map>
+
+#include "engine/VtrError.h"
+#include "sequencelib/ByteSource.h"
+#include "sequencelib/LoadFailure.h"
+#include "sequencelib/XmlPieceReader.h"
+
+namespace vtr::seqlib {
+
+const char* IntensityFileKindName(IntensityFileKind kind) {
+    return kind == IntensityFileKind::Gridcraft ? "Gridcraft" : "Novalux";
+}
+
+std::shared_ptr<IntensityFile> Sequence::IntensityFileOf(IntensityFileKind kind) const {
+    return kind == IntensityFileKind::Gridcraft ? gridcraft_ : novalux_;
+}
+
+void Sequence::SetIntensityFile(std::shared_ptr<IntensityFile> file, int32_t trackIndex) {
+    if (!file)
+        return;
+    if (trackIndex < 0 || static_cast<std::size_t>(trackIndex) >= tracks_.size()) {
+        Raise(ErrorNumbers::SubscriptOutOfRange, "Sequence.SetIntensityFile",
+              "No track " + std::to_string(trackIndex) + " to carry the intensity file");
+    }
+    std::shared_ptr<IntensityFile>& slot =
+        file->Kind() == IntensityFileKind::Gridcraft ? gridcraft_ : novalux_;
+    if (slot) {
+        if (auto previous = slot->CarryingTrack()) {
+            auto& list = previous->intensityFiles_;
+            list.erase(std::remove(list.begin(), list.end(), slot), list.end());
+        }
+    }
+    const std::shared_ptr<Track>& track = tracks_[static_cast<std::size_t>(trackIndex)];
+    file->track_ = track;
+    file->trackIndex_ = trackIndex;
+    track->intensityFiles_.push_back(file);
+    slot = std::move(file);
+}
+
+// Turns the pieces of a sequence file into the sequence: channels as they come, tracks
+// with their channel references (resolved once every channel is known), intensity files.
+class SequenceBuilder final : public detail::XmlPieceHandler {
+  public:
+    SequenceBuilder(Sequence& sequence, const detail::XmlPieceReader& reader)
+        : sequence_(sequence), reader_(reader) {}
+
+    void EnterElement(const pugi::xml_node& startTag) override {
+        const Context parent = stack_.empty() ? Context::Document : stack_.back();
+        stack_.push_back(Begin(parent, startTag));
+    }
+
+    void CompleteElement(const pugi::xml_node& element) override { Walk(stack_.back(), element); }
+
+    void LeaveElement() override {
+        End(stack_.back());
+        stack_.pop_back();
+    }
+
+    // Resolves the channel references that named a channel not yet read.
+    void Finish() {
+        for (const PendingReference& ref : pending_) {
+            const auto found = channelsById_.find(ref.id);
+            if (found == channelsById_.end()) {
+                detail::FailLoad(detail::PlaceText(ref.place),
+                                 "the <channelRef> names no channel (id \"" + ref.id + "\")");
+            }
+            ref.track->channels_[ref.slot] = found->second;
+        }
+    }
+
+  private:
+    enum class Context {
+        Document,
+        Sequence,
+        Channels,
+        Channel,
+        Tracks,
+        Track,
+        IntensityFile,
+        Ignored
+    };
+
+    struct PendingReference {
+        Track* track;
+        std::size_t slot;
+        std::string id;
+        detail::TextPlace place;
+    };
+
+    static bool Is(const char* name, const char* expected) {
+        return std::strcmp(name, expected) == 0;
+    }
+
+    void Walk(Context parent, const pugi::xml_node& element) {
+        const Context context = Begin(parent, element);
+        if (context != Context::Ignored) {
+            for (pugi::xml_node child = element.first_child(); child;
+                 child = child.next_sibling()) {
+                if (child.type() == pugi::node_element)
+                    Walk(context, child);
+            }
+        }
+        End(context);
+    }
+
+    Context Begin(Context parent, const pugi::xml_node& element) {
+        const char* name = element.name();
+        switch (parent) {
+            case Context::Document:
+                if (!Is(name, "sequence")) {
+                    Fail(element,
+                         std::string("the root element is <") + name + ">, not <sequence>");
+                }
+                ReadSequence(element);
+                return Context::Sequence;
+            case Context::Sequence:
+                if (Is(name, "channels"))
+                    return Context::Channels;
+                if (Is(name, "tracks"))
+                    return Context::Tracks;
+                return Context::Ignored;
+            case Context::Channels:
+                if (!Is(name, "channel"))
+                    return Context::Ignored;
+                BeginChannel(element);
+                return Context::Channel;
+            case Context::Channel:
+                if (Is(name, "event"))
+                    ReadEvent(element);
+                return Context::Ignored;
+            case Context::Tracks:
+                if (!Is(name, "track"))
+                    return Context::Ignored;
+                BeginTrack(element);
+                return Context::Track;
+            case Context::Track:
+                if (Is(name, "channelRef")) {
+                    ReadChannelRef(element);
+                } else if (Is(name, "intensityFile") && BeginIntensityFile(element)) {
+                    return Context::IntensityFile;
+                }
+                return Context::Ignored;
+            case Context::IntensityFile:
+                if (Is(name, "device"))
+                    ReadDevice(element);
+                return Context::Ignored;
+            case Context::Ignored:
+                return Context::Ignored;
+        }
+        return Context::Ignored;
+    }
+
+    void End(Context context) {
+        switch (context) {
+            case Context::Channel:
+                channel_ = nullptr;
+                break;
+            case Context::Track:
+                track_ = nullptr;
+                break;
+            case Context::IntensityFile:
+                intensityFile_ = nullptr;
+                break;
+            default:
+                break;
+        }
+    }
+
+    // --- Attributes ---
+
+    [[noreturn]] void Fail(const pugi::xml_node& node, std::string cause) const {
+        detail::FailLoad(detail::PlaceText(reader_.PlaceOf(node)), std::move(cause));
+    }
+    [[noreturn]] void Fail(const pugi::xml_attribute& attribute, std::string cause) const {
+        detail::FailLoad(detail::PlaceText(reader_.PlaceOf(attribute)), std::move(cause));
+    }
+
+    // Marks a known attribute as read; a second one of the same name is refused.
+    void Once(unsigned& seen, unsigned bit, const pugi::xml_attribute& attribute,
+              const char* element) const {
+        if ((seen & bit) != 0) {
+            Fail(attribute, std::string("the attribute ") + attribute.name() + " of <" + element +
+                                "> is repeated");
+        }
+        seen |= bit;
+    }
+
+    int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
+                  int64_t max) const {
+        const char* text = attribute.value();
+        const char* end = text + std::strlen(text);
+        int64_t value = 0;
+        const auto [stop, error] = std::from_chars(text, end, value);
+        if (text == end || error != std::errc() || stop != end || value < min || value > max) {
+            Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + text +
+                                "\" of <" + element + "> is not a whole number from " +
+                                std::to_string(min) + " to " + std::to_string(max));
+        }
+        return value;
+    }
+
+    static constexpr int64_t kLongMax = std::numeric_limits<int32_t>::max();
+    static constexpr int64_t kLongMin = std::numeric_limits<int32_t>::min();
+    static constexpr int64_t kIntegerMax = std::numeric_limits<int16_t>::max();
+    static constexpr int64_t kLevelMax = 100;
+
+    void ReadSequence(const pugi::xml_node& element) {
+        unsigned seen = 0;
+        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
+            const char* name = a.name();
+            if (Is(name, "formatVersion")) {
+                Once(seen, 1, a, "sequence");
+                sequence_.SetFormatVersion(static_cast<int32_t>(Whole(a, "sequence", 0, kLongMax)));
+            } else if (Is(name, "length")) {
+                Once(seen, 2, a, "sequence");
+                sequence_.SetLength(static_cast<int32_t>(Whole(a, "sequence", 0, kLongMax)));
+            } else if (Is(name, "media")) {
+                Once(seen, 4, a, "sequence");
+                sequence_.SetMedia(a.value());
+            } else if (Is(name, "shellCommand")) {
+                Once(seen, 8, a, "sequence");
+                sequence_.SetShellCommand(a.value());
+            }
+        }
+    }
+
+    void BeginChannel(const pugi::xml_node& element) {
+        pugi::xml_attribute idAttribute;
+        std::string name, subsequence;
+        int64_t type = 0, deviceType = 0, network = 0, unit = 0, circuit = 0, circuits = 1;
+        unsigned seen = 0;
+        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
+            const char* n = a.name();
+            if (Is(n, "id")) {
+                Once(seen, 1, a, "channel");
+                idAttribute = a;
+            } else if (Is(n, "name")) {
+                Once(seen, 2, a, "channel");
+                name = a.value();
+            } else if (Is(n, "type")) {
+                Once(seen, 4, a, "channel");
+                type = Whole(a, "channel", 0, kLongMax);
+            } else if (Is(n, "subsequence")) {
+                Once(seen, 8, a, "channel");
+                subsequence = a.value();
+            } else if (Is(n, "deviceType")) {
+                Once(seen, 16, a, "channel");
+                deviceType = Whole(a, "channel", 0, kLongMax);
+            } else if (Is(n, "network")) {
+                Once(seen, 32, a, "channel");
+                network = Whole(a, "channel", 0, kLongMax);
+            } else if (Is(n, "unit")) {
+                Once(seen, 64, a, "channel");
+                unit = Whole(a, "channel", 0, 255);
+            } else if (Is(n, "circuit")) {
+                Once(seen, 128, a, "channel");
+                circuit = Whole(a, "channel", 0, kIntegerMax);
+            } else if (Is(n, "circuits")) {
+                Once(seen, 256, a, "channel");
+                circuits = Whole(a, "channel", 0, kIntegerMax);
+            }
+        }
+        if (!idAttribute || *idAttribute.value() == '\0')
+            Fail(element, "the <channel> has no id");
+        const std::string_view id = idAttribute.value();
+        if (channelsById_.count(id) != 0) {
+            Fail(idAttribute, "the channel id \"" + std::string(id) + "\" is repeated");
+        }
+        auto channel = std::make_shared<Channel>(std::string(id));
+        channel->SetName(std::move(name));
+        channel->SetChannelType(static_cast<int32_t>(type));
+        channel->SetSubsequenceFile(std::move(subsequence));
+        channel->SetDevice(DeviceAddress(static_cast<int32_t>(deviceType),
+                                         static_cast<int32_t>(network), static_cast<uint8_t>(unit),
+                                         static_cast<int16_t>(circuit),
+                                         static_cast<int16_t>(circuits)));
+        channel_ = channel.get();
+        channelsById_.emplace(std::string_view(channel->Id()), channel);
+        sequence_.AddChannel(std::move(channel));
+    }
+
+    void ReadEvent(const pugi::xml_node& element) {
+        int64_t start = 0, end = 0, intensity = 0, from = 0, to = 0;
+        bool hasIntensity = false;
+        unsigned seen = 0;
+        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
+            const char* n = a.name();
+            switch (n[0]) {
+                case 's':
+                    if (Is(n, "start")) {
+                        Once(seen, 1, a, "event");
+                        start = Whole(a, "event", kLongMin, kLongMax);
+                    }
+                    break;
+                case 'e':
+                    if (Is(n, "end")) {
+                        Once(seen, 2, a, "event");
+                        end = Whole(a, "event", kLongMin, kLongMax);
+                    }
+                    break;
+                case 'i':
+                    if (Is(n, "intensity")) {
+                        Once(seen, 4, a, "event");
+                        intensity = Whole(a, "event", 0, kLevelMax);
+                        hasIntensity = true;
+                    }
+                    break;
+                case 'f':
+                    if (Is(n, "from")) {
+                        Once(seen, 8, a, "event");
+                        from = Whole(a, "event", 0, kLevelMax);
+                    }
+                    break;
+                case 't':
+                    if (Is(n, "to")) {
+                        Once(seen, 16, a, "event");
+                        to = Whole(a, "event", 0, kLevelMax);
+                    }
+                    break;
+                default:
+                    break;
+            }
+        }
+        // On when the level is positive over part of [0, length).
+        const int64_t level = hasIntensity ? intensity : std::max(from, to);
+        if (level > 0 && std::max<int64_t>(start, 0) < std::min<int64_t>(end, sequence_.Length())) {
+            channel_->SetEverOn(true);
+        }
+    }
+
+    void BeginTrack(const pugi::xml_node& element) {
+        auto track = std::make_shared<Track>();
+        track->SetLength(sequence_.Length());
+        unsigned seen = 0;
+        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
+            const char* n = a.name();
+            if (Is(n, "name")) {
+                Once(seen, 1, a, "track");
+                track->SetName(a.value());
+            } else if (Is(n, "length")) {
+                Once(seen, 2, a, "track");
+                track->SetLength(static_cast<int32_t>(Whole(a, "track", 0, kLongMax)));
+            }
+        }
+        track_ = track.get();
+        trackIndex_ = static_cast<int32_t>(sequence_.Tracks().size());
+        sequence_.AddTrack(std::move(track));
+    }
+
+    void ReadChannelRef(const pugi::xml_node& element) {
+        const pugi::xml_attribute idAttribute = element.attribute("id");
+        const std::string_view id = idAttribute.value();
+        const auto found = channelsById_.find(id);
+        if (found != channelsById_.end()) {
+            track_->AddChannel(found->second);
+            return;
+        }
+        // Perhaps a channel further on: resolved when the file is read.
+        pending_.push_back(
+            {track_, track_->channels_.size(), std::string(id), reader_.PlaceOf(element)});
+        track_->channels_.push_back(nullptr);
+    }
+
+    bool BeginIntensityFile(const pugi::xml_node& element) {
+        const std::string_view kind = element.attribute("kind").value();
+        IntensityFileKind fileKind;
+        if (kind == "Gridcraft") {
+            fileKind = IntensityFileKind::Gridcraft;
+        } else if (kind == "Novalux") {
+            fileKind = IntensityFileKind::Novalux;
+        } else {
+            return false;
+        }
+        if (sequence_.IntensityFileOf(fileKind)) {
+            Fail(element, std::string("a second ") + IntensityFileKindName(fileKind) +
+                              " intensity file (a sequence has at most one of each kind)");
+        }
+        auto file = std::make_shared<IntensityFile>(fileKind, element.attribute("name").value());
+        intensityFile_ = file.get();
+        sequence_.SetIntensityFile(std::move(file), trackIndex_);
+        return true;
+    }
+
+    void ReadDevice(const pugi::xml_node& element) {
+        int64_t deviceType = 0, network = 0, unit = 0, start = 0, count = 1;
+        unsigned seen = 0;
+        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
+            const char* n = a.name();
+            if (Is(n, "deviceType")) {
+                Once(seen, 1, a, "device");
+                deviceType = Whole(a, "device", 0, kLongMax);
+            } else if (Is(n, "network")) {
+                Once(seen, 2, a, "device");
+                network = Whole(a, "device", 0, kLongMax);
+            } else if (Is(n, "unit")) {
+                Once(seen, 4, a, "device");
+                unit = Whole(a, "device", 0, 255);
+            } else if (Is(n, "start")) {
+                Once(seen, 8, a, "device");
+                start = Whole(a, "device", 0, kIntegerMax);
+            } else if (Is(n, "count")) {
+                Once(seen, 16, a, "device");
+                count = Whole(a, "device", 0, kIntegerMax);
+            }
+        }
+        intensityFile_->AddDevice(DeviceAddress(
+            static_cast<int32_t>(deviceType), static_cast<int32_t>(network),
+            static_cast<uint8_t>(unit), static_cast<int16_t>(start), static_cast<int16_t>(count)));
+    }
+
+    Sequence& sequence_;
+    const detail::XmlPieceReader& reader_;
+    std::vector<Context> stack_;
+    std::unordered_map<std::string_view, std::shared_ptr<Channel>> channelsById_;
+    Channel* channel_ = nullptr;
+    Track* track_ = nullptr;
+    int32_t trackIndex_ = -1;
+    IntensityFile* intensityFile_ = nullptr;
+    std::vector<PendingReference> pending_;
+};
+
+namespace {
+
+std::string LoadErrorText(const std::string& fileName, const detail::LoadFailure& failure) {
+    std::string text = "Cannot load sequence file \"" + fileName + "\": ";
+    if (!failure.where.empty())
+        text += failure.where + ": ";
+    return text + failure.cause;
+}
+
+}  // namespace
+
+void Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
+                    const LoadOptions& options) {
+    Sequence loaded;
+    loaded.fileName_ = fileName;
+    try {
+        const auto source = detail::OpenDecodedFile(fileName, options.maxExpandedBytes);
+        int32_t told = -1;
+        const auto tell = [&](int32_t percent) {
+            if (progress && percent > told) {
+                told = percent;
+                progress(percent);
+            }
+        };
+        tell(0);
+        detail::XmlPieceReader reader(*source, options.pieceBytes);
+        SequenceBuilder builder(loaded, reader);
+        reader.Run(builder, [&] {
+            const std::uint64_t total = source->FileBytesTotal();
+            if (total == 0)
+                return;
+            const std::uint64_t done = std::min(source->FileBytesConsumed(), total);
+            tell(static_cast<int32_t>(std::min<std::uint64_t>(99, done * 100 / total)));
+        });
+        builder.Finish();
+        tell(100);
+    } catch (const detail::LoadFailure& failure) {
+        Raise(ErrorNumbers::UserMessage, "Sequence.Load", LoadErrorText(fileName, failure));
+    } catch (const std::bad_alloc&) {
+        Raise(ErrorNumbers::UserMessage, "Sequence.Load",
+              LoadErrorText(fileName, {{}, "not enough memory to load it"}));
+    }
+    *this = std::move(loaded);
+}
+
+}  // namespace vtr::seqlib

@@ -1,0 +1,89 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "sequencelib/Channel.h"
+#include "sequencelib/IntensityFile.h"
+#include "sequencelib/Track.h"
+
+namespace vtr::seqlib {
+
+// Told the percent of a load done: it rises from 0 to 100, each value at most once.
+using ProgressCallback = std::function<void(int32_t percent)>;
+
+// The most a compressed sequence may expand to; a larger one is refused.
+inline constexpr std::uint64_t kMaxExpandedBytes = std::uint64_t{2} << 30;
+
+struct LoadOptions {
+    // How much of the file is parsed at a time. The loader never holds the parse tree of
+    // more than about this much text, whatever the file's size.
+    std::size_t pieceBytes = std::size_t{1} << 20;
+    // Decompressed data beyond this is refused.
+    std::uint64_t maxExpandedBytes = kMaxExpandedBytes;
+};
+
+// A sequence ("lms" musical or "las" animation file, plain or gzip-compressed): its
+// channels in file order, its tracks, its intensity files, its media file and shell
+// command. It keeps what the checks ask about, not the events.
+class Sequence {
+  public:
+    // Reads the file. Raises VtrError (number 37, source "Sequence.Load") naming the file,
+    // the place in it and the cause when the file cannot be loaded; the sequence is then
+    // left as it was.
+    void Load(const std::string& fileName, const ProgressCallback& progress = {},
+              const LoadOptions& options = {});
+
+    // The file last loaded ("" for a sequence built in memory).
+    const std::string& FileName() const { return fileName_; }
+
+    int32_t FormatVersion() const { return formatVersion_; }
+    void SetFormatVersion(int32_t version) { formatVersion_ = version; }
+
+    // The sequence's length in milliseconds.
+    int32_t Length() const { return length_; }
+    void SetLength(int32_t length) { length_ = length; }
+
+    // The media (audio or video) file as the sequence names it; "" when it has none.
+    const std::string& Media() const { return media_; }
+    void SetMedia(std::string media) { media_ = std::move(media); }
+    bool HasMedia() const { return !media_.empty(); }
+
+    // The shell-command identifier; the sequence uses shell commands when it is not "".
+    const std::string& ShellCommand() const { return shellCommand_; }
+    void SetShellCommand(std::string id) { shellCommand_ = std::move(id); }
+    bool UsesShellCommands() const { return !shellCommand_.empty(); }
+
+    // Every channel of the file, in file order, whether or not a track lists it.
+    const std::vector<std::shared_ptr<Channel>>& Channels() const { return channels_; }
+    void AddChannel(std::shared_ptr<Channel> channel) { channels_.push_back(std::move(channel)); }
+
+    const std::vector<std::shared_ptr<Track>>& Tracks() const { return tracks_; }
+    void AddTrack(std::shared_ptr<Track> track) { tracks_.push_back(std::move(track)); }
+
+    // The sequence's intensity file of each kind, or nullptr.
+    std::shared_ptr<IntensityFile> GridcraftFile() const { return gridcraft_; }
+    std::shared_ptr<IntensityFile> NovaluxFile() const { return novalux_; }
+    std::shared_ptr<IntensityFile> IntensityFileOf(IntensityFileKind kind) const;
+
+    // Makes the file the sequence's one file of its kind, carried by the track at the
+    // index (which must exist). A file of the same kind that was there is replaced.
+    void SetIntensityFile(std::shared_ptr<IntensityFile> file, int32_t trackIndex);
+
+  private:
+    std::string fileName_;
+    int32_t formatVersion_ = 0;
+    int32_t length_ = 0;
+    std::string media_;
+    std::string shellCommand_;
+    std::vector<std::shared_ptr<Channel>> channels_;
+    std::vector<std::shared_ptr<Track>> tracks_;
+    std::shared_ptr<IntensityFile> gridcraft_;
+    std::shared_ptr<IntensityFile> novalux_;
+};
+
+}  // namespace vtr::seqlib

@@ -1,0 +1,153 @@
+#include "sequencelib/XmlPieceReader.h"
+
+#include <gtest/gtest.h>
+
+#include <random>
+
+#include "SeqTestFiles.h"
+#include "sequencelib/Sequence.h"
+
+namespace vtr::seqlib {
+namespace {
+
+using testing::TempFolder;
+
+// Everything a load keeps, as one text, so that two loads can be compared.
+std::string Summary(const Sequence& s) {
+    std::string text = std::to_string(s.Length()) + "|" + s.Media() + "|" + s.ShellCommand() + "\n";
+    for (const auto& c : s.Channels()) {
+        text += c->Id() + "," + c->Name() + "," + c->SettingsKey() + "," +
+                std::to_string(c->Circuits()) + "," + std::to_string(c->ChannelType()) + "," +
+                c->SubsequenceFile() + (c->IsEverOn() ? ",on\n" : ",off\n");
+    }
+    for (const auto& t : s.Tracks()) {
+        text += "track " + t->Name() + " " + std::to_string(t->Length()) + ":";
+        for (const auto& c : t->Channels())
+            text += " " + c->Id();
+        text += "\n";
+    }
+    for (const auto& file : {s.GridcraftFile(), s.NovaluxFile()}) {
+        if (!file)
+            continue;
+        text += std::string(IntensityFileKindName(file->Kind())) + " " + file->Name() + " on " +
+                std::to_string(file->TrackIndex()) + ":";
+        for (const auto& d : file->Devices()) {
+            text += " " + std::to_string(d.DeviceType()) + "/" + std::to_string(d.Network()) + "/" +
+                    std::to_string(d.StartAddress()) + "+" + std::to_string(d.NumAddresses());
+        }
+        text += "\n";
+    }
+    return text;
+}
+
+// The summary of a load, or its error (without the file name).
+std::string Outcome(const std::string& path, std::size_t pieceBytes) {
+    LoadOptions options;
+    options.pieceBytes = pieceBytes;
+    Sequence s;
+    try {
+        s.Load(path, {}, options);
+    } catch (const VtrError& e) {
+        return "error: " + e.Description().substr(e.Description().find("\": ") + 3);
+    }
+    return Summary(s);
+}
+
+// Markup that hides tags from a careless scan: comments, CDATA, processing instructions
+// and attribute values holding "<", ">", "/>" and end tags; elements too large for a
+// piece; text longer than a piece; events written with end tags.
+const char* const kTricky = R"(<?xml version="1.0"?>
+<!-- </sequence> --><sequence length="1000" media="a&amp;b.mp3" shellCommand="7">
+  <channels>
+    <!-- <channel id="fake"/> </channel> -->
+    <channel id="1" name="a &gt; b /&gt; &lt;/channel&gt;" deviceType="1" unit="3" circuit="4">
+      <event start="0" end="10" intensity="5"></event>
+      <?note </channel> ?>
+      <![CDATA[ </channel> <channel id="cdata"/> ]]>
+      <note text="</channel>" other='/>'/>
+    </channel>
+    <channel id="2" name='quote " inside' deviceType="7" network="9" circuit="500"><event start="5" end="6" from="0" to="1"/></channel>
+    <channel id="3" type="6" subsequence="Sub.las">
+      <event start="2000" end="3000" intensity="100"/>
+      <wrapper><inner><deeper a=">"/></inner></wrapper>
+    </channel>
+    Some text between channels that is longer than a small piece of the document, and more.
+    <channel id="4" name="last" deviceType="3" unit="255"/>
+  </channels>
+  <tracks>
+    <track name="T1" length="900"><channelRef id="1"/><channelRef id="3"/>
+      <intensityFile kind="Gridcraft" name="g.gci"><device deviceType="7" network="2" start="10" count="3"/><device/></intensityFile>
+    </track>
+    <track name="T2"><channelRef id="1"/><channelRef id="4"/><channelRef id="2"/>
+      <intensityFile kind="Novalux" name="n.nvx"></intensityFile>
+    </track>
+  </tracks>
+</sequence>
+<!-- the end -->
+)";
+
+TEST(XmlPieceReader, EveryPieceSizeReadsTheSameSequence) {
+    TempFolder folder;
+    const std::string path = folder.Write("tricky.lms", kTricky);
+    const std::string whole = Outcome(path, std::size_t{1} << 20);
+    ASSERT_EQ(whole.rfind("error", 0), std::string::npos) << whole;
+    EXPECT_NE(whole.find("1,a > b /> </channel>,1:0:3:4,1,0,,on"), std::string::npos) << whole;
+    EXPECT_NE(whole.find("3,,,1,6,Sub.las,off"), std::string::npos) << whole;
+    EXPECT_EQ(whole.find("fake"), std::string::npos);
+    EXPECT_EQ(whole.find("cdata"), std::string::npos);
+    for (std::size_t piece = 16; piece <= 400; piece += 7) {
+        EXPECT_EQ(Outcome(path, piece), whole) << "pieces of " << piece;
+    }
+}
+
+TEST(XmlPieceReader, CompressedTextIsCutTheSameWay) {
+    TempFolder folder;
+    const std::string plain = folder.Write("tricky.lms", kTricky);
+    const std::string packed = folder.Write("tricky.las", testing::Gzip(kTricky));
+    for (const std::size_t piece : {std::size_t{16}, std::size_t{53}, std::size_t{1} << 20}) {
+        EXPECT_EQ(Outcome(packed, piece), Outcome(plain, piece)) << piece;
+    }
+}
+
+// Damage the document one byte at a time: whatever the pieces, the load accepts the same
+// documents and reads them the same way, and refuses the same documents.
+TEST(XmlPieceReader, DamagedDocumentsAreJudgedAlikeWhateverThePieces) {
+    TempFolder folder;
+    const std::string original = kTricky;
+    std::mt19937 random(20240611);
+    const std::string bytes = "<>/\"'=!-?[]& x";
+    int refused = 0;
+    for (int round = 0; round < 400; ++round) {
+        std::string text = original;
+        const std::size_t at = random() % text.size();
+        switch (random() % 3) {
+            case 0:
+                text.erase(at, 1);
+                break;
+            case 1:
+                text.insert(at, 1, bytes[random() % bytes.size()]);
+                break;
+            default:
+                text[at] = bytes[random() % bytes.size()];
+                break;
+        }
+        const std::string path = folder.Write("damaged.lms", text);
+        const std::string whole = Outcome(path, std::size_t{1} << 20);
+        const bool wholeRefused = whole.rfind("error", 0) == 0;
+        refused += wholeRefused;
+        for (const std::size_t piece : {std::size_t{16}, std::size_t{61}}) {
+            const std::string cut = Outcome(path, piece);
+            const bool cutRefused = cut.rfind("error", 0) == 0;
+            EXPECT_EQ(cutRefused, wholeRefused)
+                << "round " << round << ", pieces of " << piece << "\n"
+                << text << "\nwhole: " << whole << "\ncut: " << cut;
+            if (!cutRefused && !wholeRefused) {
+                EXPECT_EQ(cut, whole) << text;
+            }
+        }
+    }
+    EXPECT_GT(refused, 100) << "the damage should break many documents";
+}
+
+}  // namespace
+}  // namespace vtr::seqlib
