@@ -1,25 +1,123 @@
 #include "engine/LibVerify.h"
 
 #include <algorithm>
+#include <cstdio>
+#include <deque>
+#include <exception>
+#include <memory>
+#include <unordered_map>
+#include <unordered_set>
 #include <utility>
 
+#include "checks/CheckOldKRP.h"
+#include "checks/CheckPostInstall.h"
+#include "checks/CheckWMP.h"
+#include "engine/IgnoreLists.h"
 #include "engine/VtrError.h"
+#include "environment/LibFile.h"
+#include "environment/NetworkPreferences.h"
+#include "environment/SequenceLoader.h"
+#include "schedule/Schedule.h"
+#include "schedule/WeekTime.h"
+#include "schedule/YearSchedule.h"
+#include "sequencelib/Sequence.h"
+#include "show/Show.h"
+#include "show/WholeFile.h"
 
 namespace vtr::LibVerify {
 namespace {
 
+// The queue of checks still to run: first in, first run, with their identifiers kept aside
+// so that "is this check already queued?" costs one lookup however long the queue grows.
+class PendingChecks {
+  public:
+    bool Contains(const std::string& id) const { return ids_.count(id) != 0; }
+    bool Empty() const { return queue_.empty(); }
+    std::size_t Size() const { return queue_.size(); }
+    void Append(std::string id, CheckPtr check) {
+        ids_.insert(id);
+        queue_.emplace_back(std::move(id), std::move(check));
+    }
+    const CheckPtr& Front() const { return queue_.front().second; }
+    void RemoveFront() {
+        ids_.erase(queue_.front().first);
+        queue_.pop_front();
+    }
+    void Clear() {
+        queue_.clear();
+        ids_.clear();
+    }
+
+  private:
+    std::deque<std::pair<std::string, CheckPtr>> queue_;
+    std::unordered_set<std::string> ids_;
+};
+
+// The checks that have run, in the order they finished, each identifier once.
+class DoneChecks {
+  public:
+    bool Contains(const std::string& id) const { return ids_.count(id) != 0; }
+    std::size_t Size() const { return checks_.size(); }
+    // False (and nothing recorded) when a check with that identifier is already done.
+    bool Add(const std::string& id, CheckPtr check) {
+        if (!ids_.insert(id).second)
+            return false;
+        checks_.push_back(std::move(check));
+        return true;
+    }
+    void Clear() {
+        checks_.clear();
+        ids_.clear();
+    }
+
+  private:
+    std::vector<CheckPtr> checks_;
+    std::unordered_set<std::string> ids_;
+};
+
 // The verification state: one instance for the whole program.
 struct VerificationState {
+    bool cancelled = false;
+    DoneChecks doneChecks;
+    PendingChecks pendingChecks;
+    std::vector<ResultPtr> errors;          // not-ignored results of severity Error
+    std::vector<ResultPtr> ignoredResults;  // results that matched an ignore entry
+    std::unique_ptr<NetworkPreferences> networkPreferences;
     std::vector<INotificationClient*> clients;  // in registration order
     std::function<void()> eventPump;
-
-    std::vector<ResultPtr> results;         // every not-ignored result, in the order produced
-    std::vector<ResultPtr> ignoredResults;  // results that matched an ignore entry
-    std::vector<ResultPtr> errors;          // not-ignored results of severity Error
-    std::vector<ResultPtr> warnings;        // not-ignored results of severity Warning
-
     OrderedStringSet ignoredMessageNumbers;
+    std::vector<ResultPtr> results;  // every not-ignored result, in the order produced
     OrderedStringSet ignoredResultKeys;
+    // Sequences by file name; a file that failed to load is kept as nullptr so that it is
+    // not read again in the same run.
+    std::unordered_map<std::string, std::shared_ptr<seqlib::Sequence>> sequenceCache;
+    // Shows by file name; only shows that were read and parsed are kept.
+    std::unordered_map<std::string, ShowPtr> showCache;
+    std::string tempShowFile;
+    std::string tempWeeklyFile;
+    std::string tempYearlyFile;
+    bool verifying = false;
+    // RunVerification is on the stack (verifying alone also holds after the window's
+    // BeginVerification at start-up).
+    bool running = false;
+    std::vector<ResultPtr> warnings;  // not-ignored results of severity Warning
+    SchedulePtr weeklySchedule;
+    std::string weeklyScheduleFile;
+    YearSchedulePtr yearlySchedule;
+    std::string yearlyScheduleFile;
+    FileLoadCounts loadCounts;
+
+    VerificationState() = default;
+    VerificationState(const VerificationState&) = delete;
+    VerificationState& operator=(const VerificationState&) = delete;
+    // A target selected but never verified leaves no temporary file behind when the
+    // program ends.
+    ~VerificationState() {
+        for (const std::string* name : {&tempShowFile, &tempWeeklyFile, &tempYearlyFile}) {
+            if (!name->empty())
+                std::remove(name->c_str());
+        }
+    }
 };
 
 VerificationState& State() {
@@ -39,6 +137,71 @@ void Broadcast(Operation&& operation) {
 }
 
 constexpr std::size_t kMaxDetails = 9;
+
+// The text of whatever a failed step raised.
+std::string DescribeFailure(const std::exception_ptr& failure) {
+    try {
+        std::rethrow_exception(failure);
+    } catch (const VtrError& error) {
+        return error.Description();
+    } catch (const std::exception& error) {
+        return error.what();
+    } catch (...) {
+        return "Unknown error";
+    }
+}
+
+// The week time that the temporary schedule of a single show starts and ends at: day 1,
+// 3:00:37 and 7:00:37. The odd second keeps the times apart from anything a user schedules
+// by the minute.
+constexpr int32_t kTargetDay = 1;
+constexpr int32_t kTargetStartHour = 3;
+constexpr int32_t kTargetEndHour = 7;
+constexpr int32_t kTargetMinute = 0;
+constexpr int32_t kTargetSecond = 37;
+
+[[noreturn]] void RaiseTargetError(const char* source, const std::string& description) {
+    DeleteTempFiles();
+    Raise(ErrorNumbers::UserMessage, source, description);
+}
+
+// Makes a temporary file, remembered in `slot` so that DeleteTempFiles finds it; a failure
+// deletes the temporary files made so far and raises error 37 with the text of the failure.
+const std::string& MakeTempFile(std::string& slot, const char* prefix, const char* source) {
+    try {
+        slot = LibFile::MakeTempFileName(prefix);
+    } catch (...) {
+        RaiseTargetError(source, DescribeFailure(std::current_exception()));
+    }
+    return slot;
+}
+
+// Builds the temporary schedule pair for one show and selects it.
+void BuildShowTarget(const std::string& showFile) {
+    constexpr const char* kSource = "LibVerify.VerifyShowFile";
+    VerificationState& state = State();
+
+    auto schedule = std::make_shared<Schedule>();
+    try {
+        schedule->AddShowEventByFile(showFile,
+                                     WeekTimeFunctions::NewWeekTime(kTargetDay, kTargetStartHour,
+                                                                    kTargetMinute, kTargetSecond),
+                                     WeekTimeFunctions::NewWeekTime(kTargetDay, kTargetEndHour,
+                                                                    kTargetMinute, kTargetSecond));
+    } catch (...) {
+        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+    }
+    const std::string& weeklyFile = MakeTempFile(state.tempWeeklyFile, "VTRVer-WS-", kSource);
+    if (!ResumeStep([&] { schedule->Save(weeklyFile); }))
+        RaiseTargetError(kSource, "Cannot save temporary weekly file " + weeklyFile);
+
+    YearSchedule yearSchedule;
+    const std::string& yearlyFile = MakeTempFile(state.tempYearlyFile, "VTRVer-YS-", kSource);
+    if (!ResumeStep([&] { yearSchedule.Save(yearlyFile); }))
+        RaiseTargetError(kSource, "Cannot save temporary yearly file " + yearlyFile);
+
+    SetScheduleFiles(weeklyFile, yearlyFile);
+}
 
 }  // namespace
 
@@ -137,6 +300,239 @@ OrderedStringSet& IgnoredMessageNumbers() {
 }
 OrderedStringSet& IgnoredResultKeys() {
     return State().ignoredResultKeys;
+}
+
+// --- Target selection -----------------------------------------------------------------------
+
+void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile) {
+    VerificationState& state = State();
+    state.weeklyScheduleFile = weeklyFile;
+    state.yearlyScheduleFile = yearlyFile;
+    state.weeklySchedule = nullptr;
+    state.yearlySchedule = nullptr;
+}
+
+void VerifyShowFile(const std::string& showFile) {
+    DeleteTempFiles();
+    BuildShowTarget(showFile);
+}
+
+void VerifySequenceFile(const std::string& sequenceFile) {
+    constexpr const char* kSource = "LibVerify.VerifySequenceFile";
+    DeleteTempFiles();
+    VerificationState& state = State();
+
+    Show show;
+    show.Musical()->List().push_back(sequenceFile);
+    std::string text;
+    try {
+        text = ShowFunctions::ShowToText(show);
+    } catch (...) {
+        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+    }
+    const std::string& showFile = MakeTempFile(state.tempShowFile, "VTRVer-Show-", kSource);
+    if (WriteWholeFile(showFile, text) != 0)
+        RaiseTargetError(kSource, "Cannot write temporary show file " + showFile);
+
+    BuildShowTarget(showFile);
+}
+
+const std::string& VerifiedWeeklyScheduleFile() {
+    return State().weeklyScheduleFile;
+}
+
+const std::string& VerifiedYearlyScheduleFile() {
+    return State().yearlyScheduleFile;
+}
+
+void DeleteTempFiles() {
+    VerificationState& state = State();
+    for (std::string* name : {&state.tempShowFile, &state.tempWeeklyFile, &state.tempYearlyFile}) {
+        if (!name->empty()) {
+            std::remove(name->c_str());  // a file that cannot be deleted is left to the system
+            name->clear();
+        }
+    }
+}
+
+// --- Running ---------------------------------------------------------------------------------
+
+void BeginVerification() {
+    VerificationState& state = State();
+    state.verifying = true;
+    Broadcast([](INotificationClient& client) { client.Initializing(); });
+
+    state.doneChecks.Clear();
+    state.pendingChecks.Clear();
+    state.errors.clear();
+    state.ignoredResults.clear();
+    state.results.clear();
+    state.ignoredResultKeys.Clear();
+    state.ignoredMessageNumbers.Clear();
+    state.sequenceCache.clear();
+    state.showCache.clear();
+    state.warnings.clear();
+    state.weeklySchedule = nullptr;
+    state.yearlySchedule = nullptr;
+    state.loadCounts = {};
+
+    state.cancelled = false;
+
+    ResumeStep([&] {
+        if (!state.networkPreferences)
+            state.networkPreferences = std::make_unique<NetworkPreferences>();
+        state.networkPreferences->InitFromRegistry(true);
+    });
+    ResumeStep([] { IgnoreLists::LoadIgnoreLists(); });
+
+    ResumeStep([] { AddCheck(std::make_shared<CheckPostInstall>()); });
+    ResumeStep([] { AddCheck(std::make_shared<CheckWMP>()); });
+    ResumeStep([] { AddCheck(std::make_shared<CheckOldKRP>()); });
+}
+
+void RunVerification() {
+    VerificationState& state = State();
+    // A run asked for from inside a run (a client, the event pump) would tear down the
+    // queue under the running one; it is refused.
+    if (state.running)
+        return;
+    state.running = true;
+
+    ResumeStep([] { BeginVerification(); });
+
+    while (!state.pendingChecks.Empty()) {
+        const CheckPtr check = state.pendingChecks.Front();
+        Broadcast([&](INotificationClient& client) { client.Checking(*check); });
+        // A client told of the check may have cancelled, which empties the queue; the
+        // check announced still runs.
+        if (!state.pendingChecks.Empty() && state.pendingChecks.Front() == check)
+            state.pendingChecks.RemoveFront();
+
+        ResumeStep([&] { check->Check(); });
+        // A check whose identifier is already done (the version check of an application
+        // file shares its existence check's identifier) is not recorded a second time.
+        ResumeStep([&] { state.doneChecks.Add(check->CheckIdentifier(), check); });
+        Broadcast([&](INotificationClient& client) { client.CheckCompleted(*check); });
+        ProcessPendingEvents();
+    }
+
+    ResumeStep([&] {
+        if (state.errors.empty() && state.warnings.empty())
+            AddResult(Messages::NoErrorsOrWarnings);
+    });
+
+    state.verifying = false;
+    state.running = false;
+    DeleteTempFiles();
+    const bool cancelled = state.cancelled;
+    Broadcast([&](INotificationClient& client) { client.ChecksCompleted(cancelled); });
+}
+
+void CancelVerification() {
+    VerificationState& state = State();
+    state.cancelled = true;
+    ResumeStep([] { AddResult(Messages::VerificationCancelled); });
+    while (!state.pendingChecks.Empty())
+        state.pendingChecks.RemoveFront();
+    Broadcast([](INotificationClient& client) { client.VerificationCancelled(); });
+}
+
+bool IsVerifying() {
+    return State().verifying;
+}
+
+bool IsCancelled() {
+    return State().cancelled;
+}
+
+// --- Services for checks -----------------------------------------------------------------------
+
+void AddCheck(CheckPtr check) {
+    VerificationState& state = State();
+    if (state.cancelled || !check)
+        return;
+    std::string id = check->CheckIdentifier();
+    if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
+        return;
+    state.pendingChecks.Append(std::move(id), check);
+    Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
+}
+
+std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
+    VerificationState& state = State();
+    if (auto cached = state.sequenceCache.find(fileName); cached != state.sequenceCache.end())
+        return cached->second;
+
+    ++state.loadCounts.sequenceLoads;
+    std::shared_ptr<seqlib::Sequence> sequence;
+    std::string failure;
+    try {
+        SequenceLoader loader;
+        sequence = loader.Load(fileName);
+    } catch (...) {
+        sequence = nullptr;
+        failure = DescribeFailure(std::current_exception());
+    }
+    // Kept even when empty: a file that cannot be loaded is not tried again in this run.
+    ResumeStep([&] { state.sequenceCache.emplace(fileName, sequence); });
+    if (!failure.empty())
+        PostTransientMessage(failure);  // the log says why the load failed
+    return sequence;
+}
+
+std::shared_ptr<Show> LoadShow(const std::string& fileName) {
+    VerificationState& state = State();
+    if (auto cached = state.showCache.find(fileName); cached != state.showCache.end())
+        return cached->second;
+
+    ++state.loadCounts.showReads;
+    ShowPtr show = ResumeOr(ShowPtr{}, [&] { return ShowFunctions::LoadShowFile(fileName); });
+    // A show that cannot be read is not kept, so a later request tries again.
+    if (show)
+        ResumeStep([&] { state.showCache.emplace(fileName, show); });
+    return show;
+}
+
+NetworkPreferences& GetNetworkPreferences() {
+    VerificationState& state = State();
+    if (!state.networkPreferences)
+        state.networkPreferences = std::make_unique<NetworkPreferences>();
+    return *state.networkPreferences;
+}
+
+std::shared_ptr<Schedule> GetSchedule() {
+    VerificationState& state = State();
+    if (!state.weeklySchedule) {
+        state.weeklySchedule = ResumeOr(SchedulePtr{}, [&] {
+            return ScheduleFunctions::LoadSchedule(state.weeklyScheduleFile);
+        });
+    }
+    return state.weeklySchedule;
+}
+
+std::shared_ptr<YearSchedule> GetYearSchedule() {
+    VerificationState& state = State();
+    if (!state.yearlySchedule) {
+        state.yearlySchedule = ResumeOr(YearSchedulePtr{}, [&] {
+            return YearScheduleFunctions::LoadYearSchedule(state.yearlyScheduleFile);
+        });
+    }
+    return state.yearlySchedule;
+}
+
+// --- Summary
+// ---------------------------------------------------------------------------------------
+
+int32_t ChecksPerformedCount() {
+    return static_cast<int32_t>(State().doneChecks.Size());
+}
+
+int32_t ChecksRemainingCount() {
+    return static_cast<int32_t>(State().pendingChecks.Size());
+}
+
+FileLoadCounts GetFileLoadCounts() {
+    return State().loadCounts;
 }
 
 }  // namespace vtr::LibVerify

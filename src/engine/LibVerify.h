@@ -21,9 +21,10 @@ class Sequence;
 }
 }  // namespace vtr
 
-// The verification driver: one state for the whole program. This header holds the
-// services that checks and front ends call; the run itself (targets, queue, caches)
-// is declared further down as it is built.
+// The verification driver: one state for the whole program. Every target is reduced to a
+// pair of schedule files; a run queues the three root checks and then runs the queue first
+// in, first out, each check queueing the checks that follow from what it found. The front
+// ends select a target, register a notification client and call RunVerification.
 namespace vtr::LibVerify {
 
 // --- Notification clients and the event pump -------------------------------------------
@@ -72,13 +73,19 @@ OrderedStringSet& IgnoredResultKeys();
 
 // Stores both names and drops any loaded schedules.
 void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile);
-// Wraps one show in a temporary weekly schedule ("VTRVer-WS-") and an empty calendar
-// schedule ("VTRVer-YS-"); raises error 37 when they cannot be written.
+// Wraps one show in a temporary weekly schedule ("VTRVer-WS-": one show event from day 1,
+// 3:00:37 to 7:00:37) and an empty calendar schedule ("VTRVer-YS-"); raises error 37 when
+// they cannot be made or written, after deleting every temporary file made so far. The
+// temporary files of an earlier selection that never ran are deleted first.
 void VerifyShowFile(const std::string& showFile);
-// Wraps one sequence in a temporary show ("VTRVer-Show-"), then verifies that show.
+// Wraps one sequence in a temporary show ("VTRVer-Show-", the sequence as the only entry of
+// its musical section), then verifies that show; error 37 as above.
 void VerifySequenceFile(const std::string& sequenceFile);
 const std::string& VerifiedWeeklyScheduleFile();
 const std::string& VerifiedYearlyScheduleFile();
+// Deletes the temporary show and schedule files of the current target, if any (the end of
+// every run does it too). Failures to delete are ignored.
+void DeleteTempFiles();
 
 // --- Running -------------------------------------------------------------------------------
 
@@ -108,7 +115,16 @@ std::shared_ptr<YearSchedule> GetYearSchedule();
 
 // --- Summary ---------------------------------------------------------------------------------
 
-int32_t ChecksPerformedCount();
-int32_t ChecksRemainingCount();
+int32_t ChecksPerformedCount();  // checks done, each identifier once
+int32_t ChecksRemainingCount();  // checks still queued
+
+// How often the current (or last) run read a file from disk: show files parsed (failures
+// included, as they are tried again) and sequence loads attempted. Each file is read once
+// per run however many checks ask for it.
+struct FileLoadCounts {
+    int32_t showReads = 0;
+    int32_t sequenceLoads = 0;
+};
+FileLoadCounts GetFileLoadCounts();
 
 }  // namespace vtr::LibVerify

@@ -1,0 +1,51 @@
+#include "checks/CheckAppFileExists.h"
+
+#include <memory>
+
+#include "VtrVersion.h"
+#include "checks/CheckAppFileVersion.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/Messages.h"
+#include "engine/VtrError.h"
+#include "environment/LibFile.h"
+#include "environment/VTRCommon.h"
+
+namespace vtr {
+
+std::string DefaultExpectedVersion() {
+    return std::to_string(kVersionMajor) + "." + std::to_string(kVersionMinor) + ".0." +
+           std::to_string(kVersionPatch);
+}
+
+void CheckAppFileExists::SetFilename(const std::string& filename) {
+    filename_ = filename;
+    identifier_ = {};
+}
+
+void CheckAppFileExists::SetExpectedVersion(const std::string& version) {
+    expectedVersion_ = version;
+    identifier_ = {};
+}
+
+void CheckAppFileExists::Check() {
+    const std::string path =
+        ResumeOr(std::string{}, [&] { return VTRCommon::GetAppPath() + filename_; });
+    const bool exists = ResumeOr(false, [&] { return LibFile::FileExists(path); });
+    if (!exists) {
+        ResumeStep([&] { LibVerify::AddResult(Messages::AppFileMissing, {path}); });
+        return;
+    }
+    ResumeStep([&] {
+        auto version = std::make_shared<CheckAppFileVersion>();
+        version->SetFilename(filename_);
+        version->SetExpectedVersion(expectedVersion_);
+        LibVerify::AddCheck(version);
+    });
+}
+
+std::string CheckAppFileExists::CheckIdentifier() {
+    return identifier_.Get(CheckType::AppFileExists, filename_);
+}
+
+}  // namespace vtr

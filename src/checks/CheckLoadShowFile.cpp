@@ -1,0 +1,126 @@
+#include "checks/CheckLoadShowFile.h"
+
+#include <memory>
+
+#include "checks/CheckSequenceIsNonmusical.h"
+#include "checks/CheckShowHasSequence.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/Messages.h"
+#include "engine/VtrError.h"
+#include "show/Show.h"
+
+namespace vtr {
+namespace {
+
+struct SectionRule {
+    const PlaylistPtr& (Show::*playlist)() const noexcept;
+    const char* label;
+    bool nonAudio;
+};
+
+// The five sections in the order they are walked. Background and animation sequences play
+// alongside the musical ones, so they may not carry audio of their own.
+constexpr SectionRule kSections[] = {
+    {&Show::Background, "background", true}, {&Show::Startup, "startup", false},
+    {&Show::Main, "animation", true},        {&Show::Musical, "musical", false},
+    {&Show::Shutdown, "shutdown", false},
+};
+
+ShowReference SequenceReference(const std::string& file, const std::string& label, bool nonAudio) {
+    ShowReference reference;
+    reference.kind = ShowReference::Kind::Sequence;
+    reference.sequenceFile = file;
+    reference.label = label;
+    reference.nonAudio = nonAudio;
+    return reference;
+}
+
+ShowReference TriggerReference(const TriggerPtr& trigger, const std::string& description) {
+    ShowReference reference;
+    reference.kind = ShowReference::Kind::Trigger;
+    reference.label = description;
+    reference.trigger = trigger;
+    return reference;
+}
+
+}  // namespace
+
+void CheckLoadShowFile::SetFilename(const std::string& filename) {
+    filename_ = filename;
+    identifier_ = {};
+}
+
+std::vector<ShowReference> CheckLoadShowFile::WalkShow(const Show& show) {
+    std::vector<ShowReference> references;
+    for (const SectionRule& section : kSections) {
+        const PlaylistPtr& playlist = (show.*section.playlist)();
+        if (!playlist)
+            continue;
+        for (const std::string& name : playlist->List())
+            references.push_back(SequenceReference(name, section.label, section.nonAudio));
+        if (!playlist->CleanUp().empty()) {
+            references.push_back(
+                SequenceReference(playlist->CleanUp(), section.label, section.nonAudio));
+        }
+    }
+
+    if (show.StartupType() != 0)
+        references.push_back(TriggerReference(show.StartupTrigger(), "Startup trigger"));
+
+    // Independent groups play alongside the rest of the show, so their sequences are held to
+    // the non-audio rule; dependent groups are not, whatever their MusicalAllowed flag says.
+    for (const InteractiveGroupPtr& group : show.InteractiveGroups()) {
+        if (!group)
+            continue;
+        const std::string label = "Interactive group (" + group->Name() + ")";
+        for (const TriggeredSequencesPtr& set : group->TriggeredSets()) {
+            if (!set)
+                continue;
+            references.push_back(TriggerReference(set->Trig(), label));
+            for (const std::string& name : set->Sequences())
+                references.push_back(SequenceReference(name, label, group->Independent()));
+        }
+    }
+    return references;
+}
+
+void CheckLoadShowFile::QueueSequenceChecks(const ShowReference& reference) const {
+    if (reference.nonAudio) {
+        ResumeStep([&] {
+            auto nonmusical = std::make_shared<CheckSequenceIsNonmusical>();
+            nonmusical->SetFilename(reference.sequenceFile);
+            nonmusical->SetInShowFile(filename_);
+            nonmusical->SetInShowSection(reference.label);
+            LibVerify::AddCheck(nonmusical);
+        });
+    }
+}
+
+void CheckLoadShowFile::QueueShowChecks() const {
+    ResumeStep([&] {
+        auto hasSequence = std::make_shared<CheckShowHasSequence>();
+        hasSequence->SetFilename(filename_);
+        LibVerify::AddCheck(hasSequence);
+    });
+}
+
+void CheckLoadShowFile::Check() {
+    const ShowPtr show = ResumeOr(ShowPtr{}, [&] { return LibVerify::LoadShow(filename_); });
+    if (!show) {
+        ResumeStep([&] { LibVerify::AddResult(Messages::ShowFileUnreadable, {filename_}); });
+        return;
+    }
+    const auto references = ResumeOr(std::vector<ShowReference>{}, [&] { return WalkShow(*show); });
+    for (const ShowReference& reference : references) {
+        if (reference.kind == ShowReference::Kind::Sequence)
+            QueueSequenceChecks(reference);
+    }
+    QueueShowChecks();
+}
+
+std::string CheckLoadShowFile::CheckIdentifier() {
+    return identifier_.Get(CheckType::LoadShowFile, filename_);
+}
+
+}  // namespace vtr

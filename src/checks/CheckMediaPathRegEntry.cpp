@@ -1,0 +1,27 @@
+#include "checks/CheckMediaPathRegEntry.h"
+
+#include <memory>
+
+#include "checks/CheckMediaPathExists.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/Messages.h"
+#include "engine/VtrError.h"
+
+namespace vtr {
+
+void CheckMediaPathRegEntry::Check() {
+    const std::string path =
+        ResumeOr(std::string{}, [&] { return pathService_.GetPath(kMediaDataPath); });
+    if (path.empty()) {
+        ResumeStep([] { LibVerify::AddResult(Messages::NoMediaPathRegEntry); });
+    } else {
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckMediaPathExists>()); });
+    }
+}
+
+std::string CheckMediaPathRegEntry::CheckIdentifier() {
+    return identifier_.Get(CheckType::MediaPathRegEntry, "");
+}
+
+}  // namespace vtr

@@ -1,0 +1,41 @@
+#include "checks/CheckPostInstall.h"
+
+#include <memory>
+
+#include "checks/CheckAppPathRegEntry.h"
+#include "checks/CheckMediaPathRegEntry.h"
+#include "checks/CheckNonMediaPathRegEntry.h"
+#include "checks/CheckShowPlayerMemRestarts.h"
+#include "checks/CheckUseCompressedSequences.h"
+#include "checks/CheckUserDataPathRegEntry.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/Messages.h"
+#include "engine/VtrError.h"
+#include "environment/LibRegistryVTRShared.h"
+
+namespace vtr {
+
+void CheckPostInstall::Check() {
+    // Complete once the post-install step of version 53 or later has run.
+    const int32_t version = ResumeOr(
+        int32_t{0}, [] { return LibRegistryVTRShared::GetSharedLong("PostInstallVer", "", 0); });
+    const bool done = ResumeOr(
+        false, [] { return LibRegistryVTRShared::GetSharedBool("PostInstall", "", false); });
+    if (version >= kMinimumPostInstallVersion && done) {
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckAppPathRegEntry>()); });
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckUserDataPathRegEntry>()); });
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckNonMediaPathRegEntry>()); });
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckMediaPathRegEntry>()); });
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckUseCompressedSequences>()); });
+        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckShowPlayerMemRestarts>()); });
+    } else {
+        ResumeStep([] { LibVerify::AddResult(Messages::NotFullyInstalled); });
+    }
+}
+
+std::string CheckPostInstall::CheckIdentifier() {
+    return identifier_.Get(CheckType::PostInstall, "");
+}
+
+}  // namespace vtr

@@ -1,0 +1,33 @@
+#include "checks/CheckUserDataPathExists.h"
+
+#include <memory>
+
+#include "checks/CheckShowIsScheduled.h"
+#include "checks/CheckWeeklyScheduleExists.h"
+#include "checks/CheckYearlyScheduleExists.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/Messages.h"
+#include "engine/VtrError.h"
+#include "environment/LibFile.h"
+#include "environment/VTRCommon.h"
+
+namespace vtr {
+
+void CheckUserDataPathExists::Check() {
+    const std::string path = ResumeOr(std::string{}, [] { return VTRCommon::GetUserDataPath(); });
+    const bool exists = ResumeOr(false, [&] { return LibFile::DirectoryExists(path); });
+    if (!exists) {
+        ResumeStep([&] { LibVerify::AddResult(Messages::UserDataDirectoryMissing, {path}); });
+        return;
+    }
+    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckWeeklyScheduleExists>()); });
+    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckYearlyScheduleExists>()); });
+    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckShowIsScheduled>()); });
+}
+
+std::string CheckUserDataPathExists::CheckIdentifier() {
+    return identifier_.Get(CheckType::UserDataPathExists, "");
+}
+
+}  // namespace vtr

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+// The version of the media player that the suite plays audio through. On Windows it is the
+// versionInfo property of the operating system's media player control; elsewhere there is
+// no such control, and the suite records the version of the player it uses on that host as
+// the string "VersionInfo" of "Software\Vantori\Shared\MediaPlayer".
+namespace vtr::MediaPlayerProbe {
+
+// The player's version text ("12.0.19041.1"); "" when the setting is absent. Raises when
+// the control cannot be created or asked.
+std::string VersionText();
+
+// True when the version text has exactly four "."-separated parts and the first is a whole
+// number written canonically (no sign, blank or leading zero that converting it to a
+// number and back would lose) that is at least minimumMajor. A minimum of 0 or less is
+// met by any readable text; a probe that fails meets none.
+bool IsVersionAtLeast(int32_t minimumMajor);
+// The same test on a given text.
+bool IsVersionTextAtLeast(const std::string& versionText, int32_t minimumMajor);
+
+}  // namespace vtr::MediaPlayerProbe
