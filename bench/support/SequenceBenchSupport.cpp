@@ -37,9 +37,11 @@ std::string ReadAll(const std::string& path) {
 void TimeKeepingReporter::ReportRuns(const std::vector<Run>& runs) {
     for (const Run& run : runs) {
         if (run.iterations > 0 && run.run_type == Run::RT_Iteration) {
-            const std::string name = run.benchmark_name();
-            seconds_[name.substr(0, name.find('/'))] =
-                run.real_accumulated_time / static_cast<double>(run.iterations);
+            // The name and its arguments, without the run settings ("min_time:2.000").
+            std::string name = run.benchmark_name();
+            if (const std::size_t setting = name.find("/min_time"); setting != std::string::npos)
+                name.erase(setting);
+            seconds_[name] = run.real_accumulated_time / static_cast<double>(run.iterations);
         }
     }
     ConsoleReporter::ReportRuns(runs);

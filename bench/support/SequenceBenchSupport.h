@@ -32,7 +32,7 @@ std::string ReadAll(const std::string& path);
 class TimeKeepingReporter : public benchmark::ConsoleReporter {
   public:
     void ReportRuns(const std::vector<Run>& runs) override;
-    // Seconds per iteration of the named benchmark (its name without arguments).
+    // Seconds per iteration of the named benchmark ("BM_Name/arg", without run settings).
     std::optional<double> Seconds(const std::string& name) const;
 
   private:

@@ -7,13 +7,12 @@
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "environment/VTRCommon.h"
+#include "show/WholeFile.h"
 
 namespace vtr::ResultsReport {
 
 namespace {
 
-constexpr int32_t kFileAccessError = 75;
-constexpr int32_t kDeviceIOError = 57;
 const char* const kSource = "ResultsReport.SaveResultsReport";
 
 std::string ReportText() {
@@ -50,20 +49,20 @@ void SaveResultsReport(const std::string& fileName) {
         const std::string text = ReportText();
         file = std::fopen(fileName.c_str(), "wb");
         if (file == nullptr) {
-            Raise(kFileAccessError, kSource,
+            Raise(FileErrors::PathFileAccessError, kSource,
                   "Cannot create the results file " + fileName + ": " + SystemText(errno));
         }
         errno = 0;
         if (std::fwrite(text.data(), 1, text.size(), file) != text.size() ||
             std::fflush(file) != 0) {
-            Raise(kDeviceIOError, kSource,
+            Raise(FileErrors::DeviceIoError, kSource,
                   "Cannot write the results file " + fileName + ": " +
                       SystemText(errno != 0 ? errno : EIO));
         }
         std::FILE* closing = file;
         file = nullptr;
         if (std::fclose(closing) != 0) {
-            Raise(kDeviceIOError, kSource,
+            Raise(FileErrors::DeviceIoError, kSource,
                   "Cannot write the results file " + fileName + ": " +
                       SystemText(errno != 0 ? errno : EIO));
         }

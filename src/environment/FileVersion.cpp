@@ -3,6 +3,7 @@
 #include <array>
 #include <filesystem>
 #include <fstream>
+#include <string_view>
 #include <system_error>
 #include <vector>
 
@@ -75,6 +76,23 @@ class PieceReader {
     uint64_t size_ = 0;
 };
 
+// The same over bytes in memory.
+class MemoryReader {
+  public:
+    explicit MemoryReader(std::string_view bytes) : bytes_(bytes) {}
+
+    bool Read(uint64_t offset, uint32_t length, std::vector<unsigned char>& out) const {
+        if (offset > bytes_.size() || length > bytes_.size() - offset)
+            return false;
+        out.assign(bytes_.begin() + static_cast<std::ptrdiff_t>(offset),
+                   bytes_.begin() + static_cast<std::ptrdiff_t>(offset + length));
+        return true;
+    }
+
+  private:
+    std::string_view bytes_;
+};
+
 struct Section {
     uint32_t virtualAddress;
     uint32_t virtualSize;
@@ -96,7 +114,8 @@ std::optional<uint64_t> FileOffsetOf(const std::vector<Section>& sections, uint3
 
 // The offset (from the resource section's start) of the entry of a resource directory that
 // matches: the version type at the first level, the first entry below it.
-std::optional<uint32_t> FindEntry(PieceReader& file, uint64_t resourceBase, uint32_t resourceSize,
+template <typename Reader>
+std::optional<uint32_t> FindEntry(Reader& file, uint64_t resourceBase, uint32_t resourceSize,
                                   uint32_t directoryOffset, std::optional<uint32_t> wantedId,
                                   bool wantSubdirectory) {
     std::vector<unsigned char> bytes;
@@ -125,7 +144,8 @@ std::optional<uint32_t> FindEntry(PieceReader& file, uint64_t resourceBase, uint
     return std::nullopt;
 }
 
-std::optional<FileVersionNumbers> ReadPe(PieceReader& file) {
+template <typename Reader>
+std::optional<FileVersionNumbers> ReadPe(Reader& file) {
     std::vector<unsigned char> bytes;
     if (!file.Read(0, kDosHeaderSize, bytes) || bytes[0] != 'M' || bytes[1] != 'Z')
         return std::nullopt;
@@ -265,6 +285,14 @@ std::optional<FileVersionNumbers> ReadPeFileVersion(const std::string& path) {
                             return std::nullopt;
                         PieceReader file(path);
                         return ReadPe(file);
+                    });
+}
+
+std::optional<FileVersionNumbers> ReadPeVersion(std::string_view imageBytes) {
+    return ResumeOr(std::optional<FileVersionNumbers>{},
+                    [&]() -> std::optional<FileVersionNumbers> {
+                        MemoryReader bytes(imageBytes);
+                        return ReadPe(bytes);
                     });
 }
 

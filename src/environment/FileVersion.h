@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 
 // The fixed version information (VS_FIXEDFILEINFO) of a Windows executable, library or
 // control.
@@ -28,6 +29,8 @@ std::string FileVersionText(const std::string& path);
 // nothing and a huge one costs no more than a small one. Nothing for a path that is not a
 // regular file.
 std::optional<FileVersionNumbers> ReadPeFileVersion(const std::string& path);
+// The same reader over an image in memory.
+std::optional<FileVersionNumbers> ReadPeVersion(std::string_view imageBytes);
 
 std::string FileVersionToText(const FileVersionNumbers& version);
 

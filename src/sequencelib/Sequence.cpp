@@ -1,7 +1,7 @@
 #include "sequencelib/Sequence.h"
 
 #include <algorithm>
-#include <charconv>
+#include <cstdint>
 #include <cstring>
 #include <limits>
 #include <new>
@@ -45,6 +45,26 @@ void Sequence::SetIntensityFile(std::shared_ptr<IntensityFile> file, int32_t tra
     slot = std::move(file);
 }
 
+namespace {
+
+// Channel ids are usually the numbers 1, 2, 3...: hashed as their value, they fill the
+// table in order, which keeps a large file's index in the cache. Other ids hash as text.
+struct ChannelIdHash {
+    std::size_t operator()(std::string_view id) const noexcept {
+        if (id.empty() || id.size() > 18)
+            return std::hash<std::string_view>{}(id);
+        std::size_t value = 0;
+        for (const char c : id) {
+            if (c < '0' || c > '9')
+                return std::hash<std::string_view>{}(id);
+            value = value * 10 + static_cast<std::size_t>(c - '0');
+        }
+        return value;
+    }
+};
+
+}  // namespace
+
 // Turns the pieces of a sequence file into the sequence: channels as they come, tracks
 // with their channel references (resolved once every channel is known), intensity files.
 class SequenceBuilder final : public detail::XmlPieceHandler {
@@ -67,12 +87,12 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     // Resolves the channel references that named a channel not yet read.
     void Finish() {
         for (const PendingReference& ref : pending_) {
-            const auto found = channelsById_.find(ref.id);
-            if (found == channelsById_.end()) {
+            const std::size_t index = FindChannel(ref.id);
+            if (index == kNoChannel) {
                 detail::FailLoad(detail::PlaceText(ref.place),
                                  "the <channelRef> names no channel (id \"" + ref.id + "\")");
             }
-            ref.track->channels_[ref.slot] = found->second;
+            ref.track->channels_[ref.slot] = sequence_.Channels()[index];
         }
     }
 
@@ -95,8 +115,14 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::TextPlace place;
     };
 
-    static bool Is(const char* name, const char* expected) {
-        return std::strcmp(name, expected) == 0;
+    // The name equals the literal (compared up to and with its terminating NUL).
+    template <std::size_t N>
+    static bool Is(const char* name, const char (&literal)[N]) {
+        for (std::size_t i = 0; i < N; ++i) {
+            if (name[i] != literal[i])
+                return false;
+        }
+        return true;
     }
 
     void Walk(Context parent, const pugi::xml_node& element) {
@@ -174,6 +200,25 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
     }
 
+    static constexpr std::size_t kNoChannel = static_cast<std::size_t>(-1);
+
+    // The index of the channel with that id. Tracks usually list channels in file order,
+    // or every n-th of them, so the channel one stride on from the last found is tried
+    // before the index.
+    std::size_t FindChannel(std::string_view id) {
+        const auto& channels = sequence_.Channels();
+        std::size_t index = lastFound_ + lastStride_;
+        if (index >= channels.size() || channels[index]->Id() != id) {
+            const auto found = indexById_.find(id);
+            if (found == indexById_.end())
+                return kNoChannel;
+            index = found->second;
+        }
+        lastStride_ = index > lastFound_ ? index - lastFound_ : 1;
+        lastFound_ = index;
+        return index;
+    }
+
     // --- Attributes ---
 
     [[noreturn]] void Fail(const pugi::xml_node& node, std::string cause) const {
@@ -195,11 +240,24 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
 
     int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
                   int64_t max) const {
+        // Digits, with a minus sign in front for a negative number; nothing else.
         const char* text = attribute.value();
-        const char* end = text + std::strlen(text);
+        const char* p = text;
+        const bool negative = *p == '-';
+        if (negative)
+            ++p;
         int64_t value = 0;
-        const auto [stop, error] = std::from_chars(text, end, value);
-        if (text == end || error != std::errc() || stop != end || value < min || value > max) {
+        bool valid = *p != '\0';
+        for (; *p != '\0'; ++p) {
+            if (*p < '0' || *p > '9' || value > (INT64_MAX - 9) / 10) {
+                valid = false;
+                break;
+            }
+            value = value * 10 + (*p - '0');
+        }
+        if (negative)
+            value = -value;
+        if (!valid || value < min || value > max) {
             Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + text +
                                 "\" of <" + element + "> is not a whole number from " +
                                 std::to_string(min) + " to " + std::to_string(max));
@@ -270,11 +328,11 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
         if (!idAttribute || *idAttribute.value() == '\0')
             Fail(element, "the <channel> has no id");
-        const std::string_view id = idAttribute.value();
-        if (channelsById_.count(id) != 0) {
-            Fail(idAttribute, "the channel id \"" + std::string(id) + "\" is repeated");
+        auto channel = std::make_shared<Channel>(idAttribute.value());
+        if (!indexById_.try_emplace(std::string_view(channel->Id()), sequence_.Channels().size())
+                 .second) {
+            Fail(idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
         }
-        auto channel = std::make_shared<Channel>(std::string(id));
         channel->SetName(std::move(name));
         channel->SetChannelType(static_cast<int32_t>(type));
         channel->SetSubsequenceFile(std::move(subsequence));
@@ -283,7 +341,6 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                                          static_cast<int16_t>(circuit),
                                          static_cast<int16_t>(circuits)));
         channel_ = channel.get();
-        channelsById_.emplace(std::string_view(channel->Id()), channel);
         sequence_.AddChannel(std::move(channel));
     }
 
@@ -358,9 +415,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     void ReadChannelRef(const pugi::xml_node& element) {
         const pugi::xml_attribute idAttribute = element.attribute("id");
         const std::string_view id = idAttribute.value();
-        const auto found = channelsById_.find(id);
-        if (found != channelsById_.end()) {
-            track_->AddChannel(found->second);
+        if (const std::size_t index = FindChannel(id); index != kNoChannel) {
+            track_->AddChannel(sequence_.Channels()[index]);
             return;
         }
         // Perhaps a channel further on: resolved when the file is read.
@@ -419,7 +475,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     Sequence& sequence_;
     const detail::XmlPieceReader& reader_;
     std::vector<Context> stack_;
-    std::unordered_map<std::string_view, std::shared_ptr<Channel>> channelsById_;
+    // Each channel's index in the sequence, by id.
+    std::unordered_map<std::string_view, std::size_t, ChannelIdHash> indexById_;
+    std::size_t lastFound_ = 0;
+    std::size_t lastStride_ = 1;
     Channel* channel_ = nullptr;
     Track* track_ = nullptr;
     int32_t trackIndex_ = -1;

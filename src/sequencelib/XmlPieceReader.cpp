@@ -1,7 +1,6 @@
 #include "sequencelib/XmlPieceReader.h"
 
 #include <algorithm>
-#include <bit>
 #include <cctype>
 #include <cstring>
 #include <string_view>
@@ -31,7 +30,9 @@ int64_t CountNewlines(const char* p, std::size_t n) {
         std::memcpy(&word, p + i, 8);
         const uint64_t x = word ^ kNewlines;  // a zero byte where there is a newline
         const uint64_t nonzero = ((x & kLow7) + kLow7) | x;
-        count += std::popcount(~(nonzero | kLow7));
+        // One bit (the top one) per newline byte; gather them into the low byte.
+        const uint64_t marks = ~(nonzero | kLow7) >> 7;
+        count += static_cast<int64_t>((marks * 0x0101010101010101ull) >> 56);
     }
     for (; i < n; ++i)
         count += p[i] == '\n';
@@ -375,8 +376,8 @@ void XmlPieceReader::ReadHead(XmlPieceHandler& handler) {
 void XmlPieceReader::Step(XmlPieceHandler& handler) {
     Compact();
     FillTo(pos_ + pieceBytes_);
-    if (guessPause_ > 0) {
-        --guessPause_;
+    if (open_.back().guessPause > 0) {
+        --open_.back().guessPause;
     } else if (TryGuessedPiece(handler)) {
         return;
     }
@@ -395,7 +396,6 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
             handler.LeaveElement();
             open_.pop_back();
             pos_ = cut.tag.end;
-            guessPause_ = 0;
             break;
         case CutKind::Descend: {
             const TextPlace place = PlaceAt(base_ + static_cast<int64_t>(cut.tagStart));
@@ -404,7 +404,6 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
             handler.EnterElement(element);
             open_.push_back({name, place, {}});
             pos_ = cut.tag.end;
-            guessPause_ = 0;
             break;
         }
         case CutKind::EndOfData:
@@ -447,7 +446,7 @@ bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler) {
     if (cut == npos || cut <= pos_)
         return false;
     if (!ParsePiece(pos_, cut, true)) {
-        guessPause_ = 8;
+        open_.back().guessPause = 8;
         return false;
     }
     HandlePiece(handler);
@@ -456,7 +455,7 @@ bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler) {
 }
 
 std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const {
-    const std::string_view view(buffer_.get() + from, limit - from);
+    std::string_view view(buffer_.get() + from, limit - from);
     const std::string& child = open_.back().childName;
     if (!child.empty()) {
         // After the last end tag of the kind of child seen last.
@@ -477,7 +476,20 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
         }
         return npos;
     }
-    // After the last end tag or empty-element tag.
+    // After the last end tag or empty-element tag, but never past the end tag of the element
+    // whose content this is (a large element's last piece).
+    const std::string endTag = "</" + open_.back().name;
+    for (std::size_t at = 0;;) {
+        const std::size_t match = view.find(endTag, at);
+        if (match == std::string_view::npos)
+            break;
+        const std::size_t after = match + endTag.size();
+        if (after == view.size() || view[after] == '>' || IsSpace(view[after])) {
+            view = view.substr(0, match);
+            break;
+        }
+        at = match + 1;
+    }
     std::size_t end = view.size();
     for (int tries = 0; tries < 64 && end > 0; ++tries) {
         const std::size_t gt = view.rfind('>', end - 1);
@@ -497,6 +509,8 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
 
 XmlPieceReader::Cut XmlPieceReader::ScanContent() {
     const std::size_t limit = pos_ + pieceBytes_;
+    // An element that does not end within this much is entered rather than taken whole.
+    const std::size_t descendAt = pos_ + std::max<std::size_t>(pieceBytes_ / 8, 1);
     std::size_t i = pos_;
     std::size_t lastCut = pos_;
     std::size_t firstTag = pos_;
@@ -507,9 +521,11 @@ XmlPieceReader::Cut XmlPieceReader::ScanContent() {
         return lastCut > pos_ ? piece(lastCut) : Cut{CutKind::Descend, pos_, firstTag, first};
     };
     for (;;) {
-        const std::size_t lt = FindChar(i, '<', limit);
+        const bool inFirst = depth > 0 && lastCut == pos_;
+        const std::size_t stop = inFirst ? std::max(descendAt, i + 1) : limit;
+        const std::size_t lt = FindChar(i, '<', stop);
         if (lt == npos) {
-            if (eof_ && size_ < limit) {
+            if (eof_ && size_ < stop) {
                 // The data ends: the rest is text, or an element left open that the parse
                 // of the piece reports.
                 if (depth == 0 && size_ == pos_)
@@ -541,7 +557,7 @@ XmlPieceReader::Cut XmlPieceReader::ScanContent() {
             lastCut = i;
             if (i >= limit)
                 return piece(i);
-        } else if (i >= limit) {
+        } else if (i >= limit || (lastCut == pos_ && i >= descendAt)) {
             return descend();
         }
     }

@@ -80,6 +80,7 @@ class XmlPieceReader {
         std::string name;
         TextPlace place;
         std::string childName;  // the last child element seen that had content
+        int guessPause = 0;     // steps to go without guessing, after a wrong guess
     };
 
     void ReadHead(XmlPieceHandler& handler);
@@ -139,7 +140,6 @@ class XmlPieceReader {
     pugi::xml_document doc_;
 
     std::vector<OpenElement> open_;
-    int guessPause_ = 0;
 };
 
 }  // namespace vtr::seqlib::detail
