@@ -94,7 +94,9 @@ HelpViewer::HelpViewer(QWidget* parent) : QWidget(parent, Qt::Window) {
     resize(720, 560);
 
     browser_ = new HelpBrowser(this);
+    browser_->document()->setDocumentMargin(10);
     auto* toolBar = new QToolBar(this);
+    toolBar->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
     back_ =
         toolBar->addAction(style()->standardIcon(QStyle::SP_ArrowBack), QStringLiteral("&Back"));
     back_->setShortcut(QKeySequence::Back);
@@ -103,8 +105,9 @@ HelpViewer::HelpViewer(QWidget* parent) : QWidget(parent, Qt::Window) {
                                   QStringLiteral("&Forward"));
     forward_->setShortcut(QKeySequence::Forward);
     forward_->setEnabled(false);
-    home_ =
-        toolBar->addAction(style()->standardIcon(QStyle::SP_DirHomeIcon), QStringLiteral("&Home"));
+    home_ = toolBar->addAction(
+        QIcon::fromTheme(QStringLiteral("go-home"), style()->standardIcon(QStyle::SP_DirHomeIcon)),
+        QStringLiteral("&Home"));
     home_->setShortcut(QKeySequence(Qt::ALT | Qt::Key_Home));
     auto* close = new QAction(QStringLiteral("Close"), this);
     close->setShortcut(QKeySequence(Qt::Key_Escape));

@@ -23,7 +23,6 @@
 #include <QScrollBar>
 #include <QSettings>
 #include <QShortcut>
-#include <QStatusBar>
 #include <QStyle>
 #include <QTabWidget>
 #include <QTextBlock>
@@ -308,8 +307,8 @@ void frmVerifier::BuildControls() {
     lblChecksRemainingCount_ = addCount("lblChecksRemaining", "Checks Remaining:", 1, 0);
     lblErrorsCount_ = addCount("lblErrors", "Errors Detected:", 0, 2);
     lblWarningsCount_ = addCount("lblWarnings", "Warnings Detected:", 1, 2);
-    summaryLayout->setColumnMinimumWidth(2, 0);
     summaryLayout->setColumnStretch(4, 1);
+    summaryLayout->setColumnMinimumWidth(4, 160);
     summaryLayout->setHorizontalSpacing(12);
 
     // Commands.
@@ -343,17 +342,19 @@ void frmVerifier::BuildControls() {
     layout->addWidget(sstDetails_, 1);
     layout->addLayout(bottom);
 
-    // Progress of a run and the passing status texts.
-    prgVerification_ = new QProgressBar(this);
+    // Progress of a run and the passing status text, beside the counts.
+    prgVerification_ = new QProgressBar(frameSummary_);
     prgVerification_->setObjectName(QStringLiteral("prgVerification"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
-    prgVerification_->setMaximumWidth(220);
     prgVerification_->setFormat(QStringLiteral("%v of %m checks"));
-    lblStatus_ = new QLabel(this);
+    prgVerification_->setAccessibleName(QStringLiteral("Verification progress"));
+    lblStatus_ = new QLabel(frameSummary_);
     lblStatus_->setObjectName(QStringLiteral("lblStatus"));
-    statusBar()->addWidget(lblStatus_, 1);
-    statusBar()->addPermanentWidget(prgVerification_);
+    // A long file name must not widen the window: the text is cut to the space there is.
+    lblStatus_->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Preferred);
+    summaryLayout->addWidget(prgVerification_, 0, 4);
+    summaryLayout->addWidget(lblStatus_, 1, 4);
 
     setAcceptDrops(true);
     resize(900, 640);

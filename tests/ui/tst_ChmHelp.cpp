@@ -4,6 +4,7 @@
 #include <QPixmap>
 #include <QProcess>
 #include <QStandardPaths>
+#include <QTextBlock>
 #include <QTextDocument>
 #include <QtTest>
 #include <filesystem>
@@ -46,7 +47,10 @@ ChmContent SampleHelp() {
     content.defaultTopic = "Verifier.htm";
     content.files = {
         {"/Verifier.htm", "<html><body><h1>The Verifier</h1></body></html>"},
-        {"/msg23.htm", "<html><body><h1>Sequence file does not exist</h1></body></html>"},
+        {"/msg23.htm",
+         "<html><head><link rel=\"stylesheet\" type=\"text/css\" href=\"pics/help.css\">"
+         "</head><body><h1>Sequence file does not exist</h1></body></html>"},
+        {"/pics/help.css", "h1 { color: #ff0000; }"},
         {"/msgs/msg49.htm",
          "<html><body><h1>Intensity file conflict</h1><a href=\"../msg23.htm\">see 23</a>"
          "<img src=\"../pics/dot.png\"></body></html>"},
@@ -108,7 +112,7 @@ void ChmHelpTest::readsPagesAndSystemTable() {
     std::vector<std::string> pages = file.Pages();
     std::sort(pages.begin(), pages.end());
     QCOMPARE(pages, (std::vector<std::string>{"/Verifier.htm", "/msg23.htm", "/msgs/msg49.htm",
-                                              "/pics/dot.png"}));
+                                              "/pics/dot.png", "/pics/help.css"}));
 }
 
 void ChmHelpTest::mapsContextIdsToPages() {
@@ -277,6 +281,16 @@ void ChmHelpTest::viewerFollowsRelativeLinksAndHistory() {
     // The link "../msg23.htm" leads to the page at the top of the file.
     emit viewer.Browser()->anchorClicked(QUrl(QStringLiteral("../msg23.htm")));
     QCOMPARE(viewer.CurrentPage(), QStringLiteral("/msg23.htm"));
+    // Its style sheet came from the help file too.
+    QCOMPARE(viewer.Browser()
+                 ->document()
+                 ->firstBlock()
+                 .begin()
+                 .fragment()
+                 .charFormat()
+                 .foreground()
+                 .color(),
+             QColor(255, 0, 0));
     QVERIFY(viewer.Browser()->isBackwardAvailable());
     viewer.Browser()->backward();
     QCOMPARE(viewer.CurrentPage(), QStringLiteral("/msgs/msg49.htm"));

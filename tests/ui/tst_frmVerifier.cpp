@@ -432,6 +432,17 @@ void FrmVerifierTest::runOnTheDemoInstallation() {
     QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QString::number(LibVerify::ErrorCount()));
     QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QString::number(LibVerify::WarningCount()));
     QVERIFY(LibVerify::ErrorCount() + LibVerify::WarningCount() > 0);
+#ifndef _WIN32
+    // Help on a result opens its page of the demo's help file, found by its help-context id.
+    const ResultPtr first = frmVerifier::ResultOf(Results()->topLevelItem(0));
+    Results()->setCurrentItem(Results()->topLevelItem(0));
+    Click("cmdHelp");
+    auto* viewer = window_->findChild<vtr::HelpViewer*>(QStringLiteral("HelpViewer"));
+    QVERIFY(viewer != nullptr);
+    QCOMPARE(viewer->CurrentPage(),
+             QStringLiteral("/messages/msg%1.htm").arg(first->MessageNumber()));
+    QVERIFY(dialogs_->boxes.isEmpty());
+#endif
     QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("demo.reg")),
              vtr::testsupport::ReadFileBytes(demoStore));
     window_.reset();
@@ -891,6 +902,10 @@ void FrmVerifierTest::keyboardReachesTheCommands() {
     QTest::keyClick(window_.get(), Qt::Key_V, Qt::AltModifier);
     QTRY_COMPARE(dialogs_->boxes.size(), 1);
     QCOMPARE(dialogs_->boxes[0].text, QStringLiteral("Please specify the sequence file to verify"));
+    // F1: help (here without a help file, so its error).
+    QTest::keyClick(window_.get(), Qt::Key_F1);
+    QCOMPARE(dialogs_->boxes.size(), 2);
+    QCOMPARE(dialogs_->boxes[1].title, QStringLiteral("Help File Error"));
     // The menu key opens the pop-up menu on the current result.
     LibVerify::AddResult(Severity::Warning, "Five", 5, 5);
     Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
