@@ -210,8 +210,31 @@ frmVerifier::~frmVerifier() {
 void frmVerifier::InstallPlatformHooks() {
     // The core lets the user interface run its pending events after every check and inside
     // long ones: that is where a click on Cancel arrives while a run is going.
-    LibVerify::SetEventPump([] { QCoreApplication::processEvents(); });
+    LibVerify::SetEventPump([this] { PumpEvents(); });
     ScopedMousePointer::InstallHooks([] { return g_pointer; }, &SetScreenPointer);
+}
+
+void frmVerifier::PumpEvents() {
+    if (!running_) {
+        QCoreApplication::processEvents();
+        return;
+    }
+    // During a run the core calls this after every check and result, thousands of times
+    // on a large schedule. Input is handled every time, so a click on Cancel is seen at
+    // once; the summary is brought up to date and the window drawn at most every
+    // kRepaintIntervalMs, since laying out and drawing the window costs far more than a
+    // check.
+    if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
+        repaintClock_.restart();
+        FlushLog();
+        if (summaryPending_)
+            RefreshSummary();
+        lblStatus_->setText(statusText_);
+        setUpdatesEnabled(true);
+    }
+    QCoreApplication::processEvents();
+    if (running_)
+        setUpdatesEnabled(false);
 }
 
 void frmVerifier::BuildControls() {
@@ -549,6 +572,12 @@ bool frmVerifier::SetTargetFile(const QString& path) {
 
 void frmVerifier::SetRunning(bool running) {
     running_ = running;
+    if (!running) {
+        FlushLog();
+        setUpdatesEnabled(true);
+        repaintClock_.invalidate();
+        lblStatus_->setText(statusText_);
+    }
     cmdCancel_->setEnabled(running);
     cmdVerify_->setEnabled(!running);
     cmdSave_->setEnabled(!running);
@@ -564,7 +593,22 @@ void frmVerifier::ResetSummary() {
     prgVerification_->setValue(0);
 }
 
+void frmVerifier::SummaryChanged() {
+    if (running_) {
+        summaryPending_ = true;
+    } else {
+        RefreshSummary();
+    }
+}
+
+void frmVerifier::SetStatus(const QString& text) {
+    statusText_ = text;
+    if (!running_)
+        lblStatus_->setText(text);
+}
+
 void frmVerifier::RefreshSummary() {
+    summaryPending_ = false;
     const int32_t performed = LibVerify::ChecksPerformedCount();
     const int32_t remaining = LibVerify::ChecksRemainingCount();
     lblChecksPerformedCount_->setText(QString::number(performed));
@@ -591,13 +635,26 @@ QColor frmVerifier::SeverityColour(Severity severity) {
 }
 
 void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
+    // The time stamp is taken now, whenever the line reaches the screen.
+    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), colour});
+    if (!running_)
+        FlushLog();
+}
+
+void frmVerifier::FlushLog() {
+    if (pendingLog_.isEmpty())
+        return;
     QTextCursor cursor(rtxOutputLog_->document());
     cursor.movePosition(QTextCursor::End);
-    QTextCharFormat format;
-    format.setForeground(colour);
-    // Every line ends with a line break, so the document ends with an empty block.
-    cursor.insertText(FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))) + QLatin1Char('\n'),
-                      format);
+    cursor.beginEditBlock();
+    for (const LogLine& line : std::as_const(pendingLog_)) {
+        QTextCharFormat format;
+        format.setForeground(line.colour);
+        // Every line ends with a line break, so the document ends with an empty block.
+        cursor.insertText(line.text + QLatin1Char('\n'), format);
+    }
+    cursor.endEditBlock();
+    pendingLog_.clear();
     // Keep the end in view.
     QScrollBar* scrollBar = rtxOutputLog_->verticalScrollBar();
     scrollBar->setValue(scrollBar->maximum());
@@ -607,41 +664,42 @@ void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
 
 void frmVerifier::CheckAdded(ICheck& check) {
     WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), ToQColor(OutputLog::kBlack));
-    RefreshSummary();
+    SummaryChanged();
 }
 
 void frmVerifier::CheckCompleted(ICheck&) {
-    RefreshSummary();
+    SummaryChanged();
 }
 
 void frmVerifier::Checking(ICheck& check) {
     const QString text = FromSuiteText(OutputLog::CheckingText(check));
     WriteLog(text, ToQColor(OutputLog::kBlack));
-    lblStatus_->setText(text);
+    SetStatus(text);
 }
 
 void frmVerifier::ChecksCompleted(bool cancelled) {
     WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), ToQColor(OutputLog::kBlack));
+    SetStatus(QString());
     SetRunning(false);
     RefreshSummary();
-    lblStatus_->clear();
     sstDetails_->setCurrentIndex(ResultsTab);
 }
 
 void frmVerifier::Initializing() {
+    pendingLog_.clear();
     rtxOutputLog_->clear();
     lvResults_[0]->clear();
     lvResults_[1]->clear();
     popupResult_.reset();
     resultsListed_ = 0;
-    lblStatus_->clear();
+    SetStatus(QString());
     sstDetails_->setCurrentIndex(OutputLogTab);
 }
 
 void frmVerifier::ResultAdded(const ResultPtr& result) {
     QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
     AddResultItem(list, result, resultsListed_++);
-    RefreshSummary();
+    SummaryChanged();
     WriteLog(FromSuiteText(OutputLog::ResultText(*result)), SeverityColour(result->Severity()));
     LibVerify::ProcessPendingEvents();
 }
@@ -649,11 +707,11 @@ void frmVerifier::ResultAdded(const ResultPtr& result) {
 void frmVerifier::TransientMessage(const std::string& message) {
     const QString text = FromSuiteText(message);
     WriteLog(text, ToQColor(OutputLog::kBlack));
-    lblStatus_->setText(text);
+    SetStatus(text);
 }
 
 void frmVerifier::VerificationCancelled() {
-    RefreshSummary();
+    SummaryChanged();
 }
 
 // --- The result lists ----------------------------------------------------------------------

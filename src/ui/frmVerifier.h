@@ -1,6 +1,7 @@
 #pragma once
 
 #include <QColor>
+#include <QElapsedTimer>
 #include <QHash>
 #include <QIcon>
 #include <QMainWindow>
@@ -138,10 +139,18 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QTreeWidget* BuildResultList(const QString& name);
     void BuildMenus();
     void InstallPlatformHooks();
+    // The event pump the core calls while a run goes.
+    void PumpEvents();
     void LoadPlacement();
     void SavePlacement() const;
 
     void SetRunning(bool running);
+    // The summary and the status text changed: shown at once when idle, at the next
+    // drawing of the window while a run goes.
+    void SummaryChanged();
+    void SetStatus(const QString& text);
+    // Writes the log lines kept back while a run goes.
+    void FlushLog();
     void ResetSummary();
     void ApplyTarget();
     void ChooseTarget(bool sequence);
@@ -191,6 +200,15 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QAction* mnuIgnoreMessageNumber_ = nullptr;
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
+    static constexpr qint64 kRepaintIntervalMs = 50;
+    QElapsedTimer repaintClock_;
+    bool summaryPending_ = false;
+    struct LogLine {
+        QString text;
+        QColor colour;
+    };
+    QList<LogLine> pendingLog_;
+    QString statusText_;
     bool running_ = false;
     bool closeWhenFinished_ = false;
     qint64 resultsListed_ = 0;  // the order of the next result listed
