@@ -1,4 +1,10 @@
 // The HTML Help viewer of Windows, reached through hhctrl.ocx. Compiled on Windows only.
+#ifndef NOMINMAX
+#define NOMINMAX
+#endif
+#ifndef WIN32_LEAN_AND_MEAN
+#define WIN32_LEAN_AND_MEAN
+#endif
 #include <windows.h>
 
 #include <QWidget>

@@ -11,7 +11,9 @@
 #include <QTreeWidget>
 #include <cstdio>
 
+#ifndef _WIN32
 #include "HelpViewer.h"
+#endif
 #include "environment/RegistryStore.h"
 #include "frmVerifier.h"
 
@@ -51,6 +53,7 @@ int main(int argc, char** argv) {
             results->setFocus();
         }
         QWidget* shown = &window;
+#ifndef _WIN32
         if (parser.value(tab) == QLatin1String("help")) {
             window.Help();
             if (auto* viewer = window.findChild<vtr::HelpViewer*>(QStringLiteral("HelpViewer"))) {
@@ -58,6 +61,7 @@ int main(int argc, char** argv) {
                 shown = viewer;
             }
         }
+#endif
         QTimer::singleShot(300, &window, [&, shown] {
             status = shown->grab().save(parser.positionalArguments().constFirst()) ? 0 : 1;
             application.quit();

@@ -14,6 +14,7 @@
 #include "ChmWriter.h"
 #include "HelpProvider.h"
 #include "HelpViewer.h"
+#include "UiTestMain.h"
 #include "engine/VtrError.h"
 #include "support/TempStore.h"
 
@@ -347,5 +348,5 @@ void ChmHelpTest::providerReportsWhatItCannotShow() {
              QString::fromStdString("The help file " + path + " has no page Verifier.htm"));
 }
 
-QTEST_MAIN(ChmHelpTest)
+VTR_UI_TEST_MAIN(ChmHelpTest)
 #include "tst_ChmHelp.moc"

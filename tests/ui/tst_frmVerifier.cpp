@@ -24,6 +24,7 @@
 
 #include "ChmWriter.h"
 #include "HelpViewer.h"
+#include "UiTestMain.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
@@ -919,5 +920,5 @@ void FrmVerifierTest::keyboardReachesTheCommands() {
     menu->hide();
 }
 
-QTEST_MAIN(FrmVerifierTest)
+VTR_UI_TEST_MAIN(FrmVerifierTest)
 #include "tst_frmVerifier.moc"
