@@ -1,16 +1,16 @@
 #include "checks/CheckShellCommandMapExists.h"
 
-#include "checks/ShellCommandMap.h"
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "environment/LibFile.h"
+#include "sequencelib/ShellCommandMap.h"
 
 namespace vtr {
 
 void CheckShellCommandMapExists::Check() {
     const std::string path =
-        ResumeOr(std::string(), [] { return ShellCommandMap().MapFilePath(); });
+        ResumeOr(std::string(), [] { return seqlib::ShellCommandMap().MapFilePath(); });
     if (ResumeOr(false, [&] { return LibFile::FileExists(path); }))
         return;
     ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandMapMissing, {path}); });

@@ -2,11 +2,11 @@
 
 #include <memory>
 
-#include "checks/ShellCommandMap.h"
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
+#include "sequencelib/ShellCommandMap.h"
 
 namespace vtr {
 
@@ -17,7 +17,7 @@ void CheckShellCommandSet::Check() {
         return;  // CheckSequenceLoads reports a sequence that cannot be loaded
     const std::string identifier = sequence->ShellCommand();
     const std::string command =
-        ResumeOr(std::string(), [&] { return ShellCommandMap().CommandText(identifier); });
+        ResumeOr(std::string(), [&] { return seqlib::ShellCommandMap().CommandText(identifier); });
     if (!command.empty())
         return;
     ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandNotSet, {sequenceFile_}); });

@@ -157,9 +157,20 @@ void SelectTarget(const Options& options) {
     }
 }
 
+// The target as an absolute path, as the window's file dialogs give it: the results (and so
+// the keys of ignored results) then name the same file wherever the command is run from.
+std::string AbsoluteTarget(const std::string& file) {
+    std::error_code error;
+    const fs::path absolute = fs::absolute(fs::path(file), error);
+    return error ? file : absolute.lexically_normal().string();
+}
+
 }  // namespace
 
-int RunVerify(const Options& options, Console& console) {
+int RunVerify(const Options& givenOptions, Console& console) {
+    Options options = givenOptions;
+    if (options.target != TargetKind::Schedule)
+        options.targetFile = AbsoluteTarget(options.targetFile);
     if (const std::string problem = SetUpProblem(options); !problem.empty()) {
         Fail(console.err, problem);
         return ExitStatus::CannotSetUp;
