@@ -2,8 +2,11 @@
 
 #include <memory>
 
+#include "checks/CheckIntersequenceConflicts.h"
+#include "checks/CheckSequenceFileExists.h"
 #include "checks/CheckSequenceIsNonmusical.h"
 #include "checks/CheckShowHasSequence.h"
+#include "checks/CheckTriggerDefinedNetwork.h"
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
 #include "engine/Messages.h"
@@ -86,6 +89,10 @@ std::vector<ShowReference> CheckLoadShowFile::WalkShow(const Show& show) {
 }
 
 void CheckLoadShowFile::QueueSequenceChecks(const ShowReference& reference) const {
+    ResumeStep([&] {
+        LibVerify::AddCheck(
+            std::make_shared<CheckSequenceFileExists>(reference.sequenceFile, "show " + filename_));
+    });
     if (reference.nonAudio) {
         ResumeStep([&] {
             auto nonmusical = std::make_shared<CheckSequenceIsNonmusical>();
@@ -103,6 +110,11 @@ void CheckLoadShowFile::QueueShowChecks() const {
         hasSequence->SetFilename(filename_);
         LibVerify::AddCheck(hasSequence);
     });
+    ResumeStep([&] {
+        auto conflicts = std::make_shared<CheckIntersequenceConflicts>();
+        conflicts->SetShowFilename(filename_);
+        LibVerify::AddCheck(conflicts);
+    });
 }
 
 void CheckLoadShowFile::Check() {
@@ -113,8 +125,14 @@ void CheckLoadShowFile::Check() {
     }
     const auto references = ResumeOr(std::vector<ShowReference>{}, [&] { return WalkShow(*show); });
     for (const ShowReference& reference : references) {
-        if (reference.kind == ShowReference::Kind::Sequence)
+        if (reference.kind == ShowReference::Kind::Sequence) {
             QueueSequenceChecks(reference);
+        } else {
+            ResumeStep([&] {
+                LibVerify::AddCheck(std::make_shared<CheckTriggerDefinedNetwork>(
+                    filename_, reference.trigger, reference.label));
+            });
+        }
     }
     QueueShowChecks();
 }

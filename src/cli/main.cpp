@@ -1,13 +1,11 @@
 #include <cstdio>
-#include <string_view>
+#include <iostream>
 
-#include "VtrVersion.h"
+#include "App.h"
+#include "Terminal.h"
 
 int main(int argc, char** argv) {
-    if (argc == 2 && std::string_view(argv[1]) == "--version") {
-        std::printf("vantori-verify %s\n", vtr::kVersionText);
-        return 0;
-    }
-    std::fprintf(stderr, "usage: vantori-verify --version\n");
-    return 64;
+    vtr::cli::Console console{std::cout, std::cerr, vtr::cli::IsTerminal(stderr),
+                              vtr::cli::TerminalColumns(stderr)};
+    return vtr::cli::Main(argc, argv, console);
 }

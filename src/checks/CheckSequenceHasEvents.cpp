@@ -1,0 +1,38 @@
+#include "checks/CheckSequenceHasEvents.h"
+
+#include <memory>
+
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/VtrError.h"
+#include "sequencelib/Sequence.h"
+
+namespace vtr {
+
+void CheckSequenceHasEvents::Check() {
+    const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
+                                   [&] { return LibVerify::LoadSequence(filename_); });
+    if (!sequence)
+        return;
+    for (const auto& track : sequence->Tracks()) {
+        for (const auto& channel : track->Channels()) {
+            if (channel->IsEverOn())
+                return;
+        }
+    }
+    // A Gridcraft intensity file with a device lights the sequence on its own.
+    const auto gridcraft = sequence->GridcraftFile();
+    if (gridcraft && gridcraft->DeviceCount() > 0)
+        return;
+    ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCompletelyOff, {filename_}); });
+}
+
+std::string CheckSequenceHasEvents::CheckIdentifier() {
+    return identifier_.Get(CheckType::SequenceHasEvents, filename_);
+}
+
+std::string CheckSequenceHasEvents::Description() {
+    return "Sequence has events: " + filename_;
+}
+
+}  // namespace vtr

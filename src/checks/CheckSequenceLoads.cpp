@@ -1,0 +1,77 @@
+#include "checks/CheckSequenceLoads.h"
+
+#include <memory>
+
+#include "checks/CheckChannelLengthConflicts.h"
+#include "checks/CheckChannelsHaveEvents.h"
+#include "checks/CheckChannelsHaveSettings.h"
+#include "checks/CheckMediaFileExists.h"
+#include "checks/CheckSeqChannelConflicts.h"
+#include "checks/CheckSequenceFileExists.h"
+#include "checks/CheckSequenceHasEvents.h"
+#include "checks/CheckShellCommandMapExists.h"
+#include "checks/CheckShellCommandSet.h"
+#include "checks/CheckUsedNetworksDefined.h"
+#include "checks/MediaPathResolver.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/VtrError.h"
+#include "sequencelib/Sequence.h"
+
+namespace vtr {
+
+void CheckSequenceLoads::Check() {
+    const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
+                                   [&] { return LibVerify::LoadSequence(filename_); });
+    if (!sequence) {
+        ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_}); });
+        return;
+    }
+
+    if (sequence->HasMedia()) {
+        const std::string media = ResumeOr(std::string(), [&] {
+            return MediaPathResolver().Resolve(sequence->Media(), filename_);
+        });
+        ResumeStep(
+            [&] { LibVerify::AddCheck(std::make_shared<CheckMediaFileExists>(media, filename_)); });
+    }
+
+    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckSequenceHasEvents>(filename_)); });
+    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckSeqChannelConflicts>(filename_)); });
+    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckChannelsHaveEvents>(filename_)); });
+    ResumeStep(
+        [&] { LibVerify::AddCheck(std::make_shared<CheckChannelsHaveSettings>(filename_)); });
+    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckUsedNetworksDefined>(filename_)); });
+    ResumeStep(
+        [&] { LibVerify::AddCheck(std::make_shared<CheckChannelLengthConflicts>(filename_)); });
+
+    // Every sequence played as a subsequence is verified in full, as deep as the files go;
+    // a chain that comes back to a sequence already verified ends there, its checks being
+    // known to the driver by their identifiers.
+    const std::string referencedIn = "sequence " + filename_;
+    for (const auto& track : sequence->Tracks()) {
+        for (const auto& channel : track->Channels()) {
+            if (channel->IsSubsequence() && !channel->SubsequenceFile().empty()) {
+                ResumeStep([&] {
+                    LibVerify::AddCheck(std::make_shared<CheckSequenceFileExists>(
+                        channel->SubsequenceFile(), referencedIn));
+                });
+            }
+        }
+    }
+
+    if (sequence->UsesShellCommands()) {
+        ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandMapExists>()); });
+        ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandSet>(filename_)); });
+    }
+}
+
+std::string CheckSequenceLoads::CheckIdentifier() {
+    return identifier_.Get(CheckType::SequenceLoads, filename_);
+}
+
+std::string CheckSequenceLoads::Description() {
+    return "Sequence file loads: " + filename_;
+}
+
+}  // namespace vtr

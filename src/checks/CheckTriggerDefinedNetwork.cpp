@@ -1,0 +1,50 @@
+#include "checks/CheckTriggerDefinedNetwork.h"
+
+#include <cstdint>
+#include <memory>
+
+#include "checks/CheckTrigNetNotEnhanced.h"
+#include "engine/CheckTypes.h"
+#include "engine/LibVerify.h"
+#include "engine/VtrError.h"
+#include "environment/NetworkPreferences.h"
+#include "environment/SequenceUtils.h"
+
+namespace vtr {
+
+std::string TriggerIdentityText(const Trigger* trigger) {
+    return std::to_string(reinterpret_cast<std::uintptr_t>(trigger));
+}
+
+void CheckTriggerDefinedNetwork::Check() {
+    if (!trig_)
+        return;  // nothing to check
+    const int32_t network = trig_->Network();
+    // A network the preferences cannot hold (outside 0..15) has no port.
+    const int32_t port = ResumeOr(0, [&] {
+        return static_cast<int32_t>(LibVerify::GetNetworkPreferences().VTRNetwork(network).Port());
+    });
+    if (port == 0) {
+        ResumeStep([&] {
+            LibVerify::AddResult(
+                Messages::TriggerUndefinedNetwork,
+                {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
+                 "[TRIGGER] " + triggerDescription_});
+        });
+        return;
+    }
+    ResumeStep([&] {
+        LibVerify::AddCheck(
+            std::make_shared<CheckTrigNetNotEnhanced>(showFilename_, trig_, triggerDescription_));
+    });
+}
+
+std::string CheckTriggerDefinedNetwork::CheckIdentifier() {
+    return identifier_.Get(CheckType::TriggerDefinedNetwork, TriggerIdentityText(trig_.get()));
+}
+
+std::string CheckTriggerDefinedNetwork::Description() {
+    return "Trigger on defined network: " + triggerDescription_;
+}
+
+}  // namespace vtr

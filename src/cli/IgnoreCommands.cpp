@@ -1,0 +1,148 @@
+#include "IgnoreCommands.h"
+
+#include <nlohmann/json.hpp>
+
+#include <charconv>
+#include <ostream>
+#include <string_view>
+
+#include "engine/IgnoreLists.h"
+#include "engine/LibVerify.h"
+#include "environment/RegistryStore.h"
+
+namespace vtr::cli {
+namespace {
+
+constexpr std::string_view kDetailEnd = " / ";
+
+// Both in-memory lists, freshly read from the store.
+void ReloadIgnoreLists() {
+    LibVerify::IgnoredMessageNumbers().Clear();
+    LibVerify::IgnoredResultKeys().Clear();
+    IgnoreLists::LoadIgnoreLists();
+}
+
+std::string StoreName() {
+    const auto file = RegistryStore::CurrentFile();
+    return file ? "the settings store " + *file : std::string("the registry");
+}
+
+std::string Quoted(const std::string& text) {
+    return "\"" + text + "\"";
+}
+
+}  // namespace
+
+std::optional<Result> ResultFromIgnoreKey(const std::string& key) {
+    const std::size_t dash = key.find('-', key.rfind('-', 0) == 0 ? 1 : 0);
+    if (dash == std::string::npos || dash == 0)
+        return std::nullopt;
+    const std::string number = key.substr(0, dash);
+    int32_t messageNumber = 0;
+    const auto [end, error] =
+        std::from_chars(number.data(), number.data() + number.size(), messageNumber);
+    // Only the number's own decimal text can appear in a key ("007" or "+7" never does).
+    if (error != std::errc() || end != number.data() + number.size() ||
+        std::to_string(messageNumber) != number)
+        return std::nullopt;
+
+    const std::string details = key.substr(dash + 1);
+    if (!details.empty() && !details.ends_with(kDetailEnd))
+        return std::nullopt;
+    Result result;
+    result.SetMessageNumber(messageNumber);
+    // The key joins the details with " / " after each; one detail that holds the whole text
+    // gives the same key, whatever " / " the details themselves contain.
+    if (!details.empty())
+        result.AddDetail(details.substr(0, details.size() - kDetailEnd.size()));
+    return result;
+}
+
+int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& err) {
+    const bool ignore = options.command == Command::Ignore;
+    ReloadIgnoreLists();
+
+    std::string what;
+    bool listed = false;
+    if (options.messageNumber) {
+        const std::string text = std::to_string(*options.messageNumber);
+        what = "Results with message number " + text;
+        listed = IgnoreLists::IsMessageNumberIgnored(text);
+        if (ignore)
+            IgnoreLists::IgnoreMessageNumber(*options.messageNumber);
+        else
+            IgnoreLists::UnignoreMessageNumber(*options.messageNumber);
+    } else {
+        const std::string key = options.ignoreKey.value_or("");
+        const std::optional<Result> result = ResultFromIgnoreKey(key);
+        if (!result) {
+            err << "vantori-verify: " << Quoted(key)
+                << " is not a result's key: a key is the message number, \"-\", then each "
+                   "detail followed by \" / \" (as \"vantori-verify ignored\" and --format "
+                   "json show it)\n";
+            return ExitStatus::Usage;
+        }
+        what = "The result " + Quoted(key);
+        listed = IgnoreLists::IsIgnoreKeyIgnored(key);
+        if (ignore)
+            IgnoreLists::IgnoreResult(*result);
+        else
+            IgnoreLists::UnignoreResult(*result);
+    }
+
+    // The lists swallow store failures; read them back to see whether the change was kept.
+    if (listed != ignore) {
+        ReloadIgnoreLists();
+        const bool nowListed =
+            options.messageNumber
+                ? IgnoreLists::IsMessageNumberIgnored(std::to_string(*options.messageNumber))
+                : IgnoreLists::IsIgnoreKeyIgnored(*options.ignoreKey);
+        if (nowListed != ignore) {
+            err << "vantori-verify: the ignore list could not be saved in " << StoreName() << "\n";
+            return ExitStatus::CannotSetUp;
+        }
+    }
+
+    const bool plural = options.messageNumber.has_value();
+    if (ignore) {
+        out << what
+            << (listed ? (plural ? " are already ignored." : " is already ignored.")
+                       : " will be ignored.")
+            << "\n";
+    } else {
+        out << what
+            << (listed ? (plural ? " are no longer ignored." : " is no longer ignored.")
+                       : (plural ? " were not ignored." : " was not ignored."))
+            << "\n";
+    }
+    return ExitStatus::Clean;
+}
+
+int RunListIgnored(const Options& options, std::ostream& out) {
+    ReloadIgnoreLists();
+    const auto& numbers = LibVerify::IgnoredMessageNumbers().Entries();
+    const auto& keys = LibVerify::IgnoredResultKeys().Entries();
+
+    if (options.format == OutputFormat::Json) {
+        nlohmann::ordered_json document;
+        document["messageNumbers"] = numbers;
+        document["results"] = keys;
+        out << document.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace)
+            << "\n";
+        return ExitStatus::Clean;
+    }
+
+    out << "Ignored message numbers:\n";
+    if (numbers.empty())
+        out << "    (none)\n";
+    for (const std::string& number : numbers)
+        out << "    " << number << "\n";
+    out << "Ignored results:\n";
+    if (keys.empty())
+        out << "    (none)\n";
+    for (const std::string& key : keys)
+        out << "    " << Quoted(key) << "\n";
+    return ExitStatus::Clean;
+}
+
+}  // namespace vtr::cli

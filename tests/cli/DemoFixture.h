@@ -1,0 +1,80 @@
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "DemoInstance.h"
+#include "cli/CliTestSupport.h"
+#include "engine/LibVerify.h"
+#include "schedule/DateTime.h"
+#include "support/PeImage.h"
+#include "support/TempStore.h"
+
+namespace vtr::cli::testing {
+
+// A test on its own instance of the demo installation, made in the test's folder with a fixed
+// day of instantiation, with the clock set to that day (19:30:00) for the whole test.
+class DemoTest : public testsupport::StoreTest {
+  protected:
+    static DateTime Now() { return DateTime::FromParts(2031, 3, 14, 19, 30, 0); }
+
+    explicit DemoTest(const std::string& folderName = "demo")
+        : demoFolder_(folder_.File(folderName)), clock_([] { return Now(); }) {
+        demo::InstanceOptions options;
+        options.today = Now().Date();
+        options.writeAppFile = [](const std::string& path, const std::string& version) {
+            testsupport::WritePeImage(path, version);
+        };
+        demo::Instantiate(VTR_SOURCE_DIR "/examples/demo", demoFolder_, options);
+    }
+
+    void TearDown() override {
+        LibVerify::IgnoredMessageNumbers().Clear();
+        LibVerify::IgnoredResultKeys().Clear();
+        LibVerify::ClearResults();
+    }
+
+    // A path inside the instance.
+    std::string Demo(const std::string& relative) const { return demoFolder_ + "/" + relative; }
+    std::string DemoStore() const { return Demo("registry.reg"); }
+
+    // The command line with --registry naming the instance's store.
+    Outcome Run(std::vector<std::string> arguments, bool terminal = false, int columns = 80,
+                ProgressLine::Clock clock = {}) const {
+        arguments.push_back("--registry");
+        arguments.push_back(DemoStore());
+        return RunMain(arguments, terminal, columns, std::move(clock));
+    }
+
+    // Every file of the instance with its bytes and time of last change.
+    std::map<std::string, std::pair<std::string, std::filesystem::file_time_type>> Snapshot()
+        const {
+        std::map<std::string, std::pair<std::string, std::filesystem::file_time_type>> files;
+        for (const auto& entry : std::filesystem::recursive_directory_iterator(demoFolder_)) {
+            if (entry.is_regular_file()) {
+                files[entry.path().string()] = {testsupport::ReadFileBytes(entry.path().string()),
+                                                entry.last_write_time()};
+            }
+        }
+        return files;
+    }
+
+    // What the test's temporary folder holds (the driver's temporary files land there).
+    std::vector<std::string> TempFiles() const {
+        std::vector<std::string> names;
+        for (const auto& entry : std::filesystem::directory_iterator(TempDir()))
+            names.push_back(entry.path().filename().string());
+        return names;
+    }
+
+    std::string demoFolder_;
+
+  private:
+    ScopedNowSource clock_;
+};
+
+}  // namespace vtr::cli::testing
