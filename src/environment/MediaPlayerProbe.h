@@ -9,9 +9,17 @@
 // the string "VersionInfo" of "Software\Vantori\Shared\MediaPlayer".
 namespace vtr::MediaPlayerProbe {
 
-// The player's version text ("12.0.19041.1"); "" when the setting is absent. Raises when
-// the control cannot be created or asked.
+// The player's version text ("12.0.19041.1"); "" when the setting is absent or no control
+// is installed. Raises when an installed control cannot be created or asked.
 std::string VersionText();
+
+#ifdef _WIN32
+// The versionInfo property of the media player control registered under progId, read
+// through COM from the control's core interface: "" when no such control is installed;
+// raises when it cannot be created or has no such interface. VersionText asks the
+// operating system's control, "WMPlayer.OCX".
+std::string ControlVersionText(const std::string& progId);
+#endif
 
 // True when the version text has exactly four "."-separated parts and the first is a whole
 // number written canonically (no sign, blank or leading zero that converting it to a
