@@ -70,7 +70,8 @@ void WriteFileBytes(const std::string& path, const std::string& bytes);
 
 // A test with its own temporary folder, a store file "registry.reg" in it (missing until
 // written: an empty store) selected for the test, and TMPDIR pointing into the folder so
-// that temporary files land there too.
+// that temporary files land there too (on Windows TMP as well, which the system's
+// temporary-folder service reads).
 class StoreTest : public ::testing::Test {
   protected:
     StoreTest();
@@ -87,6 +88,9 @@ class StoreTest : public ::testing::Test {
     std::string storeFile_;
     ScopedStore store_;
     ScopedEnvironment tmpdir_;
+#ifdef _WIN32
+    ScopedEnvironment tmp_;
+#endif
 };
 
 }  // namespace vtr::testsupport
