@@ -79,7 +79,7 @@ int main(int argc, char** argv) {
     if (const auto full = times.Seconds("BM_NetworkPreferencesFullStore")) {
         std::printf(
             "\nReading every network preference from the full store: %.1f ms "
-            "(%.1f us per value read)\n",
+            "(%.1f us of processor time per value read)\n",
             *full * 1e3, *full * 1e6 / (999 * 7 + 16 * 9 + 6));
     }
     delete folder;

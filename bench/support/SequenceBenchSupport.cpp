@@ -41,7 +41,7 @@ void TimeKeepingReporter::ReportRuns(const std::vector<Run>& runs) {
             std::string name = run.benchmark_name();
             if (const std::size_t setting = name.find("/min_time"); setting != std::string::npos)
                 name.erase(setting);
-            seconds_[name] = run.real_accumulated_time / static_cast<double>(run.iterations);
+            seconds_[name] = run.cpu_accumulated_time / static_cast<double>(run.iterations);
         }
     }
     ConsoleReporter::ReportRuns(runs);

@@ -28,7 +28,8 @@ class BenchFolder {
 // The whole file as bytes.
 std::string ReadAll(const std::string& path);
 
-// Prints as the console does and keeps the real time per iteration of each benchmark.
+// Prints as the console does and keeps the processor time per iteration of each benchmark
+// (steadier than the wall clock on a shared machine), from which the ratios are taken.
 class TimeKeepingReporter : public benchmark::ConsoleReporter {
   public:
     void ReportRuns(const std::vector<Run>& runs) override;

@@ -1,6 +1,7 @@
 #include "checks/CheckAppFileExists.h"
 
 #include <memory>
+#include <utility>
 
 #include "VtrVersion.h"
 #include "checks/CheckAppFileVersion.h"
@@ -13,19 +14,12 @@
 
 namespace vtr {
 
+CheckAppFileExists::CheckAppFileExists(std::string filename)
+    : AppFileCheck(CheckType::AppFileExists, "Application file existence: ", std::move(filename)) {}
+
 std::string DefaultExpectedVersion() {
     return std::to_string(kVersionMajor) + "." + std::to_string(kVersionMinor) + ".0." +
            std::to_string(kVersionPatch);
-}
-
-void CheckAppFileExists::SetFilename(const std::string& filename) {
-    filename_ = filename;
-    identifier_ = {};
-}
-
-void CheckAppFileExists::SetExpectedVersion(const std::string& version) {
-    expectedVersion_ = version;
-    identifier_ = {};
 }
 
 void CheckAppFileExists::Check() {
@@ -42,10 +36,6 @@ void CheckAppFileExists::Check() {
         version->SetExpectedVersion(expectedVersion_);
         LibVerify::AddCheck(version);
     });
-}
-
-std::string CheckAppFileExists::CheckIdentifier() {
-    return identifier_.Get(CheckType::AppFileExists, filename_);
 }
 
 }  // namespace vtr

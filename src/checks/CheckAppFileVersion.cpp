@@ -1,5 +1,7 @@
 #include "checks/CheckAppFileVersion.h"
 
+#include <utility>
+
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
 #include "engine/Messages.h"
@@ -9,15 +11,8 @@
 
 namespace vtr {
 
-void CheckAppFileVersion::SetFilename(const std::string& filename) {
-    filename_ = filename;
-    identifier_ = {};
-}
-
-void CheckAppFileVersion::SetExpectedVersion(const std::string& version) {
-    expectedVersion_ = version;
-    identifier_ = {};
-}
+CheckAppFileVersion::CheckAppFileVersion(std::string filename)
+    : AppFileCheck(CheckType::AppFileVersion, "Application file version: ", std::move(filename)) {}
 
 void CheckAppFileVersion::Check() {
     const std::string path =
@@ -30,11 +25,6 @@ void CheckAppFileVersion::Check() {
                 {"[FILE]: " + path, "[EXPECTED]: " + expectedVersion_, "[FOUND]: " + found});
         });
     }
-}
-
-std::string CheckAppFileVersion::CheckIdentifier() {
-    // The same identifier as the file's existence check, on purpose.
-    return identifier_.Get(CheckType::AppFileVersion, filename_);
 }
 
 }  // namespace vtr

@@ -2,6 +2,7 @@
 
 #include <memory>
 #include <unordered_map>
+#include <utility>
 
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
@@ -11,6 +12,10 @@
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
+
+CheckChannelLengthConflicts::CheckChannelLengthConflicts(std::string filename)
+    : FileCheck(CheckType::ChannelLengthConflicts,
+                "Channel length conflicts: ", std::move(filename)) {}
 
 void CheckChannelLengthConflicts::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
@@ -47,14 +52,6 @@ void CheckChannelLengthConflicts::Check() {
             });
         }
     }
-}
-
-std::string CheckChannelLengthConflicts::CheckIdentifier() {
-    return identifier_.Get(CheckType::ChannelLengthConflicts, filename_);
-}
-
-std::string CheckChannelLengthConflicts::Description() {
-    return "Channel length conflicts: " + filename_;
 }
 
 }  // namespace vtr

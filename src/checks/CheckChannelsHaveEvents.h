@@ -2,32 +2,18 @@
 
 #include <string>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 
 namespace vtr {
 
 // Reports message 28 for every channel (per track that lists it) that is never on, except a
 // channel named "c0" that is the first channel of the first track: the placeholder channel of
 // an empty sequence.
-class CheckChannelsHaveEvents : public ICheck {
+class CheckChannelsHaveEvents : public FileCheck {
   public:
-    CheckChannelsHaveEvents() = default;
-    explicit CheckChannelsHaveEvents(std::string filename) : filename_(std::move(filename)) {}
-
-    const std::string& Filename() const { return filename_; }
-    void SetFilename(std::string filename) {
-        filename_ = std::move(filename);
-        identifier_ = {};
-    }
+    explicit CheckChannelsHaveEvents(std::string filename = {});
 
     void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override;
-
-  private:
-    std::string filename_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

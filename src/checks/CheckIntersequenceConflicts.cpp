@@ -7,6 +7,8 @@
 #include <unordered_set>
 #include <vector>
 
+#include <utility>
+
 #include "checks/BlobberConflictHelper.h"
 #include "checks/CheckSequenceFileExists.h"
 #include "engine/CheckTypes.h"
@@ -78,7 +80,7 @@ struct SectionRecord {
 class IntersequenceWalk {
   public:
     IntersequenceWalk(const std::string& showFilename, int32_t animationType)
-        : showFilename_(showFilename) {
+        : filename_(showFilename) {
         const std::array<std::pair<int32_t, int32_t>, 6> masks = {{
             {kBackground, 63},
             {kStartup, 1},
@@ -220,7 +222,7 @@ class IntersequenceWalk {
                                const Registration& other) {
         LibVerify::AddResult(
             Messages::ChannelConflict,
-            {"[SHOW]: " + showFilename_,
+            {"[SHOW]: " + filename_,
              "[SECTION]: " + CheckIntersequenceConflicts::SectionName(section),
              "[SEQUENCE]: " + walked_[sequence].name, "[TRACK]: " + TrackTextOf(sequence, track),
              "[CHANNEL]: " + channel.Name(),
@@ -234,7 +236,7 @@ class IntersequenceWalk {
                            const ChannelRecord& record, const seqlib::Channel& channel) {
         LibVerify::AddResult(
             Messages::ChannelIntensityFileConflict,
-            {"[SHOW]: " + showFilename_,
+            {"[SHOW]: " + filename_,
              "[SECTION]: " + CheckIntersequenceConflicts::SectionName(record.section),
              "[SEQUENCE]: " + walked_[record.sequence].name,
              "[TRACK]: " + TrackTextOf(record.sequence, record.track),
@@ -249,7 +251,7 @@ class IntersequenceWalk {
                            const BlobberRecord& second, const seqlib::DeviceAddress& secondDevice) {
         LibVerify::AddResult(
             Messages::IntensityFileConflict,
-            {"[SHOW]: " + showFilename_,
+            {"[SHOW]: " + filename_,
              "[SECTION]: " + CheckIntersequenceConflicts::SectionName(first.section),
              "[SEQUENCE]: " + walked_[first.sequence].name,
              "[INTENSITY FILE]: " + BlobberKindName(first.kind),
@@ -260,7 +262,7 @@ class IntersequenceWalk {
              "[RANGE]: " + SequenceUtils::DescribeDeviceAddress(secondDevice)});
     }
 
-    const std::string& showFilename_;
+    const std::string& filename_;
     BlobberConflictHelper helper_;
     std::array<SectionRecord, 6> sections_;
     std::vector<WalkedSequence> walked_;
@@ -268,6 +270,10 @@ class IntersequenceWalk {
 };
 
 }  // namespace
+
+CheckIntersequenceConflicts::CheckIntersequenceConflicts(std::string showFilename)
+    : FileCheck(CheckType::IntersequenceConflicts,
+                "Intersequence channel conflicts: ", std::move(showFilename)) {}
 
 std::string CheckIntersequenceConflicts::SectionName(int32_t flag) {
     switch (flag) {
@@ -290,11 +296,11 @@ std::string CheckIntersequenceConflicts::SectionName(int32_t flag) {
 
 void CheckIntersequenceConflicts::Check() {
     const auto show =
-        ResumeOr(std::shared_ptr<Show>(), [&] { return LibVerify::LoadShow(showFilename_); });
+        ResumeOr(std::shared_ptr<Show>(), [&] { return LibVerify::LoadShow(filename_); });
     if (!show)
         return;  // CheckLoadShowFile reports a show that cannot be loaded
     const int32_t animationType = show->Main() ? show->Main()->AnimationType() : 0;
-    IntersequenceWalk walk(showFilename_, animationType);
+    IntersequenceWalk walk(filename_, animationType);
 
     const auto walkPlaylist = [&](int32_t flag, const PlaylistPtr& playlist) {
         if (!playlist)
@@ -318,14 +324,6 @@ void CheckIntersequenceConflicts::Check() {
                 ResumeStep([&] { walk.WalkSequence(kInteractive, name); });
         }
     }
-}
-
-std::string CheckIntersequenceConflicts::CheckIdentifier() {
-    return identifier_.Get(CheckType::IntersequenceConflicts, showFilename_);
-}
-
-std::string CheckIntersequenceConflicts::Description() {
-    return "Intersequence channel conflicts: " + showFilename_;
 }
 
 }  // namespace vtr

@@ -2,9 +2,9 @@
 
 #include <cstdint>
 #include <string>
+#include <utility>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 
 namespace vtr {
 
@@ -15,29 +15,18 @@ namespace vtr {
 // only over the background. Every sequence is walked once per time it is listed, in the
 // order Background, Startup, Animation, Musical, Shutdown, Interactive, each channel being
 // compared with the sequences walked before it.
-class CheckIntersequenceConflicts : public ICheck {
+class CheckIntersequenceConflicts : public FileCheck {
   public:
-    CheckIntersequenceConflicts() = default;
-    explicit CheckIntersequenceConflicts(std::string showFilename)
-        : showFilename_(std::move(showFilename)) {}
-
-    const std::string& ShowFilename() const { return showFilename_; }
-    void SetShowFilename(std::string showFilename) {
-        showFilename_ = std::move(showFilename);
-        identifier_ = {};
-    }
+    explicit CheckIntersequenceConflicts(std::string showFilename = {});
+    // The file of the check, by the name its creator knows it.
+    const std::string& ShowFilename() const { return Filename(); }
+    void SetShowFilename(std::string showFilename) { SetFilename(std::move(showFilename)); }
 
     void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override;
 
     // The name of a section flag in results: 1 "Background", 2 "Startup", 4 "Animation",
     // 8 "Musical", 16 "Interactive", 32 "Shutdown"; any other "(" + the number + ")".
     static std::string SectionName(int32_t flag);
-
-  private:
-    std::string showFilename_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

@@ -1,6 +1,7 @@
 #include "checks/CheckLoadShowFile.h"
 
 #include <memory>
+#include <utility>
 
 #include "checks/CheckIntersequenceConflicts.h"
 #include "checks/CheckSequenceFileExists.h"
@@ -49,10 +50,8 @@ ShowReference TriggerReference(const TriggerPtr& trigger, const std::string& des
 
 }  // namespace
 
-void CheckLoadShowFile::SetFilename(const std::string& filename) {
-    filename_ = filename;
-    identifier_ = {};
-}
+CheckLoadShowFile::CheckLoadShowFile(std::string filename)
+    : FileCheck(CheckType::LoadShowFile, "Load show file: ", std::move(filename)) {}
 
 std::vector<ShowReference> CheckLoadShowFile::WalkShow(const Show& show) {
     std::vector<ShowReference> references;
@@ -135,10 +134,6 @@ void CheckLoadShowFile::Check() {
         }
     }
     QueueShowChecks();
-}
-
-std::string CheckLoadShowFile::CheckIdentifier() {
-    return identifier_.Get(CheckType::LoadShowFile, filename_);
 }
 
 }  // namespace vtr

@@ -3,8 +3,7 @@
 #include <string>
 #include <vector>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 #include "show/Trigger.h"
 
 namespace vtr {
@@ -31,14 +30,11 @@ struct ShowReference {
 
 // A show file can be read; queues the checks of everything the show refers to, then the
 // checks of the show as a whole.
-class CheckLoadShowFile : public ICheck {
+class CheckLoadShowFile : public FileCheck {
   public:
-    void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override { return "Load show file: " + filename_; }
+    explicit CheckLoadShowFile(std::string filename = {});
 
-    const std::string& Filename() const { return filename_; }
-    void SetFilename(const std::string& filename);
+    void Check() override;
 
     // Every sequence and trigger of the show in the order their checks are queued: the five
     // sections (background, startup, animation, musical, shutdown), each list in order and
@@ -49,9 +45,6 @@ class CheckLoadShowFile : public ICheck {
   private:
     void QueueSequenceChecks(const ShowReference& reference) const;
     void QueueShowChecks() const;
-
-    std::string filename_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

@@ -3,6 +3,7 @@
 #include <memory>
 #include <unordered_map>
 #include <unordered_set>
+#include <utility>
 #include <vector>
 
 #include "checks/BlobberConflictHelper.h"
@@ -16,6 +17,10 @@
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
+
+CheckSeqChannelConflicts::CheckSeqChannelConflicts(std::string filename)
+    : FileCheck(CheckType::SeqChannelConflicts,
+                "Sequence file channel conflicts: ", std::move(filename)) {}
 
 namespace {
 
@@ -135,14 +140,6 @@ void CheckSeqChannelConflicts::Check() {
                 found);
         });
     }
-}
-
-std::string CheckSeqChannelConflicts::CheckIdentifier() {
-    return identifier_.Get(CheckType::SeqChannelConflicts, filename_);
-}
-
-std::string CheckSeqChannelConflicts::Description() {
-    return "Sequence file channel conflicts: " + filename_;
 }
 
 }  // namespace vtr

@@ -1,6 +1,7 @@
 #include "checks/CheckSequenceHasEvents.h"
 
 #include <memory>
+#include <utility>
 
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
@@ -8,6 +9,9 @@
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
+
+CheckSequenceHasEvents::CheckSequenceHasEvents(std::string filename)
+    : FileCheck(CheckType::SequenceHasEvents, "Sequence has events: ", std::move(filename)) {}
 
 void CheckSequenceHasEvents::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
@@ -25,14 +29,6 @@ void CheckSequenceHasEvents::Check() {
     if (gridcraft && gridcraft->DeviceCount() > 0)
         return;
     ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCompletelyOff, {filename_}); });
-}
-
-std::string CheckSequenceHasEvents::CheckIdentifier() {
-    return identifier_.Get(CheckType::SequenceHasEvents, filename_);
-}
-
-std::string CheckSequenceHasEvents::Description() {
-    return "Sequence has events: " + filename_;
 }
 
 }  // namespace vtr

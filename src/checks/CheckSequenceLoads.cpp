@@ -1,6 +1,7 @@
 #include "checks/CheckSequenceLoads.h"
 
 #include <memory>
+#include <utility>
 
 #include "checks/CheckChannelLengthConflicts.h"
 #include "checks/CheckChannelsHaveEvents.h"
@@ -19,6 +20,9 @@
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
+
+CheckSequenceLoads::CheckSequenceLoads(std::string filename)
+    : FileCheck(CheckType::SequenceLoads, "Sequence file loads: ", std::move(filename)) {}
 
 void CheckSequenceLoads::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
@@ -64,14 +68,6 @@ void CheckSequenceLoads::Check() {
         ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandMapExists>()); });
         ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandSet>(filename_)); });
     }
-}
-
-std::string CheckSequenceLoads::CheckIdentifier() {
-    return identifier_.Get(CheckType::SequenceLoads, filename_);
-}
-
-std::string CheckSequenceLoads::Description() {
-    return "Sequence file loads: " + filename_;
 }
 
 }  // namespace vtr

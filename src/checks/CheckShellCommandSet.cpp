@@ -10,9 +10,12 @@
 
 namespace vtr {
 
+CheckShellCommandSet::CheckShellCommandSet(std::string sequenceFile)
+    : FileCheck(CheckType::ShellCommandSet, "Shell command set: ", std::move(sequenceFile)) {}
+
 void CheckShellCommandSet::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
-                                   [&] { return LibVerify::LoadSequence(sequenceFile_); });
+                                   [&] { return LibVerify::LoadSequence(filename_); });
     if (!sequence)
         return;  // CheckSequenceLoads reports a sequence that cannot be loaded
     const std::string identifier = sequence->ShellCommand();
@@ -20,15 +23,7 @@ void CheckShellCommandSet::Check() {
         ResumeOr(std::string(), [&] { return seqlib::ShellCommandMap().CommandText(identifier); });
     if (!command.empty())
         return;
-    ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandNotSet, {sequenceFile_}); });
-}
-
-std::string CheckShellCommandSet::CheckIdentifier() {
-    return identifier_.Get(CheckType::ShellCommandSet, sequenceFile_);
-}
-
-std::string CheckShellCommandSet::Description() {
-    return "Shell command set: " + sequenceFile_;
+    ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandNotSet, {filename_}); });
 }
 
 }  // namespace vtr

@@ -1,33 +1,22 @@
 #pragma once
 
 #include <string>
+#include <utility>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 
 namespace vtr {
 
 // Reports message 42 when the shell-command map gives no command for the sequence's
 // shell-command identifier.
-class CheckShellCommandSet : public ICheck {
+class CheckShellCommandSet : public FileCheck {
   public:
-    CheckShellCommandSet() = default;
-    explicit CheckShellCommandSet(std::string sequenceFile)
-        : sequenceFile_(std::move(sequenceFile)) {}
-
-    const std::string& SequenceFile() const { return sequenceFile_; }
-    void SetSequenceFile(std::string sequenceFile) {
-        sequenceFile_ = std::move(sequenceFile);
-        identifier_ = {};
-    }
+    explicit CheckShellCommandSet(std::string sequenceFile = {});
+    // The file of the check, by the name its creator knows it.
+    const std::string& SequenceFile() const { return Filename(); }
+    void SetSequenceFile(std::string sequenceFile) { SetFilename(std::move(sequenceFile)); }
 
     void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override;
-
-  private:
-    std::string sequenceFile_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

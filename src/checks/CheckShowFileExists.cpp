@@ -1,6 +1,7 @@
 #include "checks/CheckShowFileExists.h"
 
 #include <memory>
+#include <utility>
 
 #include "checks/CheckLoadShowFile.h"
 #include "engine/CheckTypes.h"
@@ -11,10 +12,8 @@
 
 namespace vtr {
 
-void CheckShowFileExists::SetFilename(const std::string& filename) {
-    filename_ = filename;
-    identifier_ = {};
-}
+CheckShowFileExists::CheckShowFileExists(std::string filename)
+    : FileCheck(CheckType::ShowFileExists, "Show file existence: ", std::move(filename)) {}
 
 void CheckShowFileExists::Check() {
     if (ResumeOr(false, [&] { return LibFile::FileExists(filename_); })) {
@@ -26,10 +25,6 @@ void CheckShowFileExists::Check() {
     } else {
         ResumeStep([&] { LibVerify::AddResult(Messages::ShowFileMissing, {filename_}); });
     }
-}
-
-std::string CheckShowFileExists::CheckIdentifier() {
-    return identifier_.Get(CheckType::ShowFileExists, filename_);
 }
 
 }  // namespace vtr

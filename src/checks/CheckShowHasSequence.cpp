@@ -8,10 +8,8 @@
 
 namespace vtr {
 
-void CheckShowHasSequence::SetFilename(const std::string& filename) {
-    filename_ = filename;
-    identifier_ = {};
-}
+CheckShowHasSequence::CheckShowHasSequence(std::string filename)
+    : FileCheck(CheckType::ShowHasSequence, "Show has sequence: ", std::move(filename)) {}
 
 bool CheckShowHasSequence::HasSequence(const Show& show) {
     for (const PlaylistPtr* section :
@@ -37,10 +35,6 @@ void CheckShowHasSequence::Check() {
     if (show && ResumeOr(false, [&] { return HasSequence(*show); }))
         return;
     ResumeStep([&] { LibVerify::AddResult(Messages::ShowHasNoSequences, {filename_}); });
-}
-
-std::string CheckShowHasSequence::CheckIdentifier() {
-    return identifier_.Get(CheckType::ShowHasSequence, filename_);
 }
 
 }  // namespace vtr

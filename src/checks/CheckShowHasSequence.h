@@ -2,8 +2,7 @@
 
 #include <string>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 
 namespace vtr {
 
@@ -11,20 +10,13 @@ class Show;
 
 // A show plays at least one sequence: in one of its five sections (a list entry or a
 // clean-up sequence) or in a triggered set of an interactive group.
-class CheckShowHasSequence : public ICheck {
+class CheckShowHasSequence : public FileCheck {
   public:
-    void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override { return "Show has sequence: " + filename_; }
+    explicit CheckShowHasSequence(std::string filename = {});
 
-    const std::string& Filename() const { return filename_; }
-    void SetFilename(const std::string& filename);
+    void Check() override;
 
     static bool HasSequence(const Show& show);
-
-  private:
-    std::string filename_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

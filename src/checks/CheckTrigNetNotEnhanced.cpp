@@ -1,5 +1,7 @@
 #include "checks/CheckTrigNetNotEnhanced.h"
 
+#include <utility>
+
 #include "checks/CheckTriggerDefinedNetwork.h"
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
@@ -8,6 +10,12 @@
 #include "environment/SequenceUtils.h"
 
 namespace vtr {
+
+CheckTrigNetNotEnhanced::CheckTrigNetNotEnhanced(std::string showFilename, TriggerPtr trig,
+                                                 std::string triggerDescription)
+    : TriggerCheck(CheckType::TrigNetNotEnhanced,
+                   "Trigger on VTR Enhanced network: ", std::move(showFilename), std::move(trig),
+                   std::move(triggerDescription)) {}
 
 void CheckTrigNetNotEnhanced::Check() {
     if (!trig_)
@@ -23,14 +31,6 @@ void CheckTrigNetNotEnhanced::Check() {
             {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
              "[TRIGGER] " + triggerDescription_});
     });
-}
-
-std::string CheckTrigNetNotEnhanced::CheckIdentifier() {
-    return identifier_.Get(CheckType::TrigNetNotEnhanced, TriggerIdentityText(trig_.get()));
-}
-
-std::string CheckTrigNetNotEnhanced::Description() {
-    return "Trigger on VTR Enhanced network: " + triggerDescription_;
 }
 
 }  // namespace vtr

@@ -3,6 +3,8 @@
 #include <cstdint>
 #include <memory>
 
+#include <utility>
+
 #include "checks/CheckTrigNetNotEnhanced.h"
 #include "engine/CheckTypes.h"
 #include "engine/LibVerify.h"
@@ -12,9 +14,11 @@
 
 namespace vtr {
 
-std::string TriggerIdentityText(const Trigger* trigger) {
-    return std::to_string(reinterpret_cast<std::uintptr_t>(trigger));
-}
+CheckTriggerDefinedNetwork::CheckTriggerDefinedNetwork(std::string showFilename, TriggerPtr trig,
+                                                       std::string triggerDescription)
+    : TriggerCheck(CheckType::TriggerDefinedNetwork,
+                   "Trigger on defined network: ", std::move(showFilename), std::move(trig),
+                   std::move(triggerDescription)) {}
 
 void CheckTriggerDefinedNetwork::Check() {
     if (!trig_)
@@ -37,14 +41,6 @@ void CheckTriggerDefinedNetwork::Check() {
         LibVerify::AddCheck(
             std::make_shared<CheckTrigNetNotEnhanced>(showFilename_, trig_, triggerDescription_));
     });
-}
-
-std::string CheckTriggerDefinedNetwork::CheckIdentifier() {
-    return identifier_.Get(CheckType::TriggerDefinedNetwork, TriggerIdentityText(trig_.get()));
-}
-
-std::string CheckTriggerDefinedNetwork::Description() {
-    return "Trigger on defined network: " + triggerDescription_;
 }
 
 }  // namespace vtr

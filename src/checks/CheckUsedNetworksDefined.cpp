@@ -2,6 +2,7 @@
 
 #include <memory>
 #include <unordered_set>
+#include <utility>
 
 #include "checks/BlobberConflictHelper.h"
 #include "engine/CheckTypes.h"
@@ -13,6 +14,10 @@
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
+
+CheckUsedNetworksDefined::CheckUsedNetworksDefined(std::string filename)
+    : FileCheck(CheckType::UsedNetworksDefined,
+                "Channels use defined networks: ", std::move(filename)) {}
 
 bool CheckUsedNetworksDefined::IsNetworkDefined(const NetworkPreferences& preferences,
                                                 int32_t deviceType, int32_t network) {
@@ -79,14 +84,6 @@ void CheckUsedNetworksDefined::Check() {
             });
         }
     }
-}
-
-std::string CheckUsedNetworksDefined::CheckIdentifier() {
-    return identifier_.Get(CheckType::UsedNetworksDefined, filename_);
-}
-
-std::string CheckUsedNetworksDefined::Description() {
-    return "Channels use defined networks: " + filename_;
 }
 
 }  // namespace vtr

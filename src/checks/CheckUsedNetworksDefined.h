@@ -3,8 +3,7 @@
 #include <cstdint>
 #include <string>
 
-#include "engine/CheckUtils.h"
-#include "engine/ICheck.h"
+#include "checks/FileCheck.h"
 
 namespace vtr {
 
@@ -12,20 +11,11 @@ class NetworkPreferences;
 
 // Reports message 31 for every channel, and message 49 for every intensity-file device,
 // whose communication network is not defined in the network preferences.
-class CheckUsedNetworksDefined : public ICheck {
+class CheckUsedNetworksDefined : public FileCheck {
   public:
-    CheckUsedNetworksDefined() = default;
-    explicit CheckUsedNetworksDefined(std::string filename) : filename_(std::move(filename)) {}
-
-    const std::string& Filename() const { return filename_; }
-    void SetFilename(std::string filename) {
-        filename_ = std::move(filename);
-        identifier_ = {};
-    }
+    explicit CheckUsedNetworksDefined(std::string filename = {});
 
     void Check() override;
-    std::string CheckIdentifier() override;
-    std::string Description() override;
 
     // Whether a device of the type can reach network `network` under these preferences:
     // type 1 (the suite's own controllers) when 0 <= network <= 15 and that network has a
@@ -34,10 +24,6 @@ class CheckUsedNetworksDefined : public ICheck {
     // else an adapter (a universe outside 1..999 is never defined); any other type always.
     static bool IsNetworkDefined(const NetworkPreferences& preferences, int32_t deviceType,
                                  int32_t network);
-
-  private:
-    std::string filename_;
-    CheckUtils::IdentifierOnce identifier_;
 };
 
 }  // namespace vtr

@@ -195,7 +195,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
 
     // Ctrl-C from here on only asks for a cancellation, which the pump passes on between two
     // steps of the run; the driver then removes its temporary files as at any other end.
-    InterruptGuard interrupts;
+    auto interrupts = std::make_unique<InterruptGuard>();
     bool cancelRequested = false;
     ScopedEventPump pump([&] {
         if (InterruptGuard::Requested() && !cancelRequested && LibVerify::IsVerifying()) {
@@ -238,6 +238,8 @@ int RunVerify(const Options& givenOptions, Console& console) {
             status = ExitStatus::CannotSetUp;
         }
     }
+    // From here Ctrl-C ends the program as usual: there is nothing left to clean up.
+    interrupts.reset();
 
     if (options.format == OutputFormat::Json)
         WriteJson(console.out, record);

@@ -376,12 +376,13 @@ void XmlPieceReader::ReadHead(XmlPieceHandler& handler) {
 void XmlPieceReader::Step(XmlPieceHandler& handler) {
     Compact();
     FillTo(pos_ + pieceBytes_);
+    bool largeChildNext = false;
     if (open_.back().guessPause > 0) {
         --open_.back().guessPause;
-    } else if (TryGuessedPiece(handler)) {
+    } else if (TryGuessedPiece(handler, largeChildNext)) {
         return;
     }
-    const Cut cut = ScanContent();
+    const Cut cut = ScanContent(largeChildNext);
     switch (cut.kind) {
         case CutKind::Piece:
             if (ParsePiece(pos_, cut.at, false))
@@ -394,6 +395,9 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
             pos_ = cut.at;
             CheckEndTag(cut.tagStart, cut.tag);
             handler.LeaveElement();
+            // The parent's next guess looks for the end of a sibling of this kind.
+            if (open_.size() >= 2)
+                open_[open_.size() - 2].childName = std::move(open_.back().name);
             open_.pop_back();
             pos_ = cut.tag.end;
             break;
@@ -440,9 +444,9 @@ void XmlPieceReader::ReadEpilog() {
 
 // --- Pieces ----------------------------------------------------------------------------
 
-bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler) {
+bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler, bool& largeChildNext) {
     const std::size_t limit = std::min(size_, pos_ + pieceBytes_);
-    const std::size_t cut = GuessCut(pos_, limit);
+    const std::size_t cut = GuessCut(pos_, limit, largeChildNext);
     if (cut == npos || cut <= pos_)
         return false;
     if (!ParsePiece(pos_, cut, true)) {
@@ -454,13 +458,18 @@ bool XmlPieceReader::TryGuessedPiece(XmlPieceHandler& handler) {
     return true;
 }
 
-std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const {
+std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit,
+                                     bool& largeChildNext) const {
+    largeChildNext = false;
     std::string_view view(buffer_.get() + from, limit - from);
     const std::string& child = open_.back().childName;
     if (!child.empty()) {
-        // After the last end tag of the kind of child seen last.
+        // After the last end tag of the kind of child seen last, looked for only near the end
+        // of reach: a child that ends further back is one that would be entered anyway.
+        const std::size_t reach = std::max<std::size_t>(pieceBytes_ / 16, 64);
+        const std::size_t stop = view.size() > reach ? view.size() - reach : 0;
         std::size_t end = view.size();
-        while (end > 0) {
+        while (end > stop) {
             const std::size_t lt = view.rfind('<', end - 1);
             if (lt == std::string_view::npos)
                 break;
@@ -474,6 +483,8 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
             }
             end = lt;
         }
+        // No such child ends near: the next one is large.
+        largeChildNext = true;
         return npos;
     }
     // After the last end tag or empty-element tag, but never past the end tag of the element
@@ -507,10 +518,12 @@ std::size_t XmlPieceReader::GuessCut(std::size_t from, std::size_t limit) const 
     return npos;
 }
 
-XmlPieceReader::Cut XmlPieceReader::ScanContent() {
+XmlPieceReader::Cut XmlPieceReader::ScanContent(bool largeChildNext) {
     const std::size_t limit = pos_ + pieceBytes_;
-    // An element that does not end within this much is entered rather than taken whole.
-    const std::size_t descendAt = pos_ + std::max<std::size_t>(pieceBytes_ / 8, 1);
+    // An element that does not end within this much is entered rather than taken whole (at
+    // once when the element is expected to be large).
+    const std::size_t descendAt =
+        pos_ + (largeChildNext ? 1 : std::max<std::size_t>(pieceBytes_ / 32, 1));
     std::size_t i = pos_;
     std::size_t lastCut = pos_;
     std::size_t firstTag = pos_;
@@ -521,8 +534,7 @@ XmlPieceReader::Cut XmlPieceReader::ScanContent() {
         return lastCut > pos_ ? piece(lastCut) : Cut{CutKind::Descend, pos_, firstTag, first};
     };
     for (;;) {
-        const bool inFirst = depth > 0 && lastCut == pos_;
-        const std::size_t stop = inFirst ? std::max(descendAt, i + 1) : limit;
+        const std::size_t stop = depth > 0 ? std::max(descendAt, i + 1) : limit;
         const std::size_t lt = FindChar(i, '<', stop);
         if (lt == npos) {
             if (eof_ && size_ < stop) {
@@ -557,7 +569,7 @@ XmlPieceReader::Cut XmlPieceReader::ScanContent() {
             lastCut = i;
             if (i >= limit)
                 return piece(i);
-        } else if (i >= limit || (lastCut == pos_ && i >= descendAt)) {
+        } else if (i >= limit || i >= descendAt) {
             return descend();
         }
     }

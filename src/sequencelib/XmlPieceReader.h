@@ -37,14 +37,18 @@ class XmlPieceHandler {
 // Reads an XML document of any size while holding the parse tree of one piece of about
 // pieceBytes at a time. The document is cut between sibling nodes; each piece is parsed
 // by pugixml on its own, and the tags around the pieces (the document element and any
-// element larger than a piece) are checked as they pass, so a document that is not
-// well-formed is refused with the place of the fault, as a whole parse would refuse it.
+// element that does not close within a thirty-second of a piece, which is entered rather than
+// taken whole) are checked as they pass, so a document that is not well-formed is refused
+// with the place of the fault. Beyond what pugixml checks, the document must have one root
+// element with nothing but comments and processing instructions around it, an XML
+// declaration only at its start, a DOCTYPE only before the root and no NUL byte.
 //
-// A cut is first guessed after the last end tag in reach; the guess holds exactly when
-// the piece parses as complete nodes, since a parse that starts between nodes reads the
-// same bytes the same way whatever comes after them. When the guess fails, the markup is
-// scanned tag by tag (quoted attribute values, comments, CDATA sections, processing
-// instructions) to find a true cut.
+// A cut is first guessed: after the last end tag of the kind of child last seen, or
+// else after the last end tag or empty-element tag before the current element's own end
+// tag. The guess holds exactly when the piece parses as complete nodes, since a parse that
+// starts between nodes reads the same bytes the same way whatever comes after them. When
+// the guess fails, the markup is scanned tag by tag (quoted attribute values, comments,
+// CDATA sections, processing instructions) to find a true cut.
 class XmlPieceReader {
   public:
     XmlPieceReader(ByteSource& source, std::size_t pieceBytes);
@@ -87,9 +91,9 @@ class XmlPieceReader {
     void Step(XmlPieceHandler& handler);
     void ReadEpilog();
 
-    bool TryGuessedPiece(XmlPieceHandler& handler);
-    std::size_t GuessCut(std::size_t from, std::size_t limit) const;
-    Cut ScanContent();
+    bool TryGuessedPiece(XmlPieceHandler& handler, bool& largeChildNext);
+    std::size_t GuessCut(std::size_t from, std::size_t limit, bool& largeChildNext) const;
+    Cut ScanContent(bool largeChildNext);
     bool ParsePiece(std::size_t from, std::size_t to, bool guessed);
     void HandlePiece(XmlPieceHandler& handler);
     pugi::xml_node ParseStartTag(std::size_t from, std::size_t tagStart, const Lexed& tag);

@@ -85,15 +85,5 @@ TEST(SequenceGenerator, GivesEveryChannelItsOwnCircuitAndCompressesOnRequest) {
     EXPECT_FALSE(s.HasMedia());
 }
 
-TEST(SequenceGenerator, SizesTheEventsForATargetSize) {
-    SequenceGenerator::Options o;
-    o.channels = 50;
-    o.eventsPerChannel = SequenceGenerator::EventsPerChannelFor(2'000'000, 50);
-    const double size = static_cast<double>(SequenceGenerator::Xml(o).size());
-    EXPECT_NEAR(size / 2'000'000, 1.0, 0.1);
-    EXPECT_EQ(SequenceGenerator::EventsPerChannelFor(10, 50), 1);
-    EXPECT_EQ(SequenceGenerator::EventsPerChannelFor(10, 0), 0);
-}
-
 }  // namespace
 }  // namespace vtr::seqlib

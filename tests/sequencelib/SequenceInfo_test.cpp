@@ -68,15 +68,6 @@ TEST(SequenceInfoService, GivesNothingForWhatItCannotRead) {
         service.GetSequenceInfo(folder.Write("c.vtrprot", "\x1f\x8b garbage")).has_value());
 }
 
-TEST(SequenceInfoService, ReadsTheFileAgainOnEveryCall) {
-    TempFolder folder;
-    const std::string edit = folder.Write("x.vtredit", "<sequenceEdit/>");
-    const SequenceInfoService service;
-    EXPECT_EQ(service.GetSequenceInfo(edit)->ProblemCount(), 1);
-    folder.Write("x.vtredit", R"(<sequenceEdit><playback file="a.lms"/></sequenceEdit>)");
-    EXPECT_EQ(service.GetSequenceInfo(edit)->ProblemCount(), 0);
-}
-
 TEST(DeviceTypeInfo, TellsWhatAddressesEachDeviceType) {
     const DeviceTypeInfo info;
     struct Row {

@@ -119,7 +119,9 @@ TEST(SequenceLoadErrors, NameTheFileThePlaceAndTheCause) {
         {"end tag first", "</x><sequence/>",
          "line 1, column 1: an end tag before the root element"},
         {"data ends early", "<sequence>\n<channels>\n",
-         "line 2, column 11: the XML is not well-formed (start-end tags mismatch)"},
+         "line 2, column 11: the XML is not well-formed (start-end tags mismatch)",
+         "line 3, column 1: the data ends before the end tag of <channels> (opened at line 2, "
+         "column 1)"},
     };
     TempFolder folder;
     for (const BadText& bad : cases) {

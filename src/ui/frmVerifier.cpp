@@ -1,0 +1,997 @@
+#include "frmVerifier.h"
+
+#include <QAction>
+#include <QApplication>
+#include <QCloseEvent>
+#include <QCursor>
+#include <QDir>
+#include <QDragEnterEvent>
+#include <QDropEvent>
+#include <QFileInfo>
+#include <QGridLayout>
+#include <QGroupBox>
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMenu>
+#include <QMimeData>
+#include <QPlainTextEdit>
+#include <QProgressBar>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QScrollBar>
+#include <QSettings>
+#include <QShortcut>
+#include <QStyle>
+#include <QTabWidget>
+#include <QTextBlock>
+#include <QTimer>
+#include <QTreeWidget>
+#include <QVBoxLayout>
+#include <algorithm>
+#include <exception>
+
+#include "UiText.h"
+#include "engine/IgnoreLists.h"
+#include "engine/LibVerify.h"
+#include "engine/OutputLog.h"
+#include "engine/ResultsReport.h"
+#include "engine/ScopedMousePointer.h"
+#include "engine/VtrError.h"
+#include "environment/VTRCommon.h"
+
+namespace vtr {
+namespace {
+
+constexpr const char* kCaption = "Vantori Verifier";
+constexpr const char* kSource = "frmVerifier";
+constexpr const char* kHelpFileName = "VTRHelp.chm";
+
+// Message box titles.
+const QString kVerifierError = QStringLiteral("Verifier Error");
+const QString kErrorSelectingSequence = QStringLiteral("Error Selecting Sequence");
+const QString kErrorSelectingShow = QStringLiteral("Error Selecting Show");
+const QString kErrorSavingMessages = QStringLiteral("Error Saving Verifier Messages");
+const QString kHelpContextError = QStringLiteral("Help Context Error");
+const QString kHelpFileError = QStringLiteral("Help File Error");
+const QString kDoubleClickError = QStringLiteral("Details List Double Click Error");
+
+// Settings of the window's own file.
+const QString kGeometryKey = QStringLiteral("window/geometry");
+const QString kTargetKindKey = QStringLiteral("target/kind");
+const QString kTargetSequenceKey = QStringLiteral("target/sequence");
+const QString kTargetShowKey = QStringLiteral("target/show");
+
+constexpr int kDetailColumns = 9;
+
+// A list item: the result it shows (its tag) and the order in which results were listed,
+// so that a result moved between the lists lands where it was produced.
+class ResultItem : public QTreeWidgetItem {
+  public:
+    ResultItem(ResultPtr result, qint64 order)
+        : QTreeWidgetItem(UserType), result_(std::move(result)), order_(order) {}
+
+    const ResultPtr& Result() const { return result_; }
+    qint64 Order() const { return order_; }
+
+    // Sorting by a column: severity and message number by value, the texts as the user's
+    // language orders them; equal values keep the order in which they were produced.
+    bool operator<(const QTreeWidgetItem& other) const override {
+        const auto* that = dynamic_cast<const ResultItem*>(&other);
+        if (that == nullptr)
+            return QTreeWidgetItem::operator<(other);
+        const int column = treeWidget() != nullptr ? treeWidget()->sortColumn() : -1;
+        int compared = 0;
+        if (column == frmVerifier::SeverityColumn) {
+            compared =
+                static_cast<int>(result_->Severity()) - static_cast<int>(that->result_->Severity());
+        } else if (column == frmVerifier::MsgNumColumn) {
+            compared = (result_->MessageNumber() > that->result_->MessageNumber()) -
+                       (result_->MessageNumber() < that->result_->MessageNumber());
+        } else if (column >= 0) {
+            compared = QString::localeAwareCompare(text(column), other.text(column));
+        }
+        return compared != 0 ? compared < 0 : order_ < that->order_;
+    }
+
+  private:
+    ResultPtr result_;
+    qint64 order_;
+};
+
+// What a file is as a target, by its extension.
+enum class TargetKind { None, Sequence, Show };
+
+TargetKind KindOfFile(const QString& path) {
+    const QString suffix = QFileInfo(path).suffix().toLower();
+    if (suffix == QLatin1String("lss"))
+        return TargetKind::Show;
+    if (suffix == QLatin1String("las") || suffix == QLatin1String("lms"))
+        return TargetKind::Sequence;
+    return TargetKind::None;
+}
+
+QString ErrorText(const std::exception& error) {
+    if (const auto* vtrError = dynamic_cast<const VtrError*>(&error))
+        return FromSuiteText(vtrError->Description());
+    return FromSuiteText(error.what());
+}
+
+// The screen's pointer as the core's ScopedMousePointer sees it: a number. The window
+// shows it as the application's override cursor.
+int16_t g_pointer = MousePointer::Default;
+
+Qt::CursorShape CursorShapeOf(int16_t pointer) {
+    switch (pointer) {
+        case 2:
+            return Qt::CrossCursor;
+        case 3:
+            return Qt::IBeamCursor;
+        case MousePointer::Hourglass:
+            return Qt::WaitCursor;
+        case 12:
+            return Qt::ForbiddenCursor;
+        case 13:
+            return Qt::BusyCursor;
+        case 14:
+            return Qt::WhatsThisCursor;
+        case 15:
+            return Qt::SizeAllCursor;
+        default:
+            return Qt::ArrowCursor;
+    }
+}
+
+void SetScreenPointer(int16_t pointer) {
+    if (g_pointer != MousePointer::Default)
+        QApplication::restoreOverrideCursor();
+    if (pointer != MousePointer::Default)
+        QApplication::setOverrideCursor(QCursor(CursorShapeOf(pointer)));
+    g_pointer = pointer;
+}
+
+QString DefaultSettingsFile() {
+    return QSettings(QSettings::IniFormat, QSettings::UserScope, QStringLiteral("Vantori"),
+                     QStringLiteral("vantori-verifier"))
+        .fileName();
+}
+
+}  // namespace
+
+// --- Severity images -----------------------------------------------------------------------
+
+SeverityImageList::SeverityImageList(QWidget* owner) : QObject(owner) {
+    setObjectName(QStringLiteral("imlSeverity"));
+    QStyle* style = owner->style();
+    images_.insert(QStringLiteral("Info"), style->standardIcon(QStyle::SP_MessageBoxInformation));
+    images_.insert(QStringLiteral("Warning"), style->standardIcon(QStyle::SP_MessageBoxWarning));
+    images_.insert(QStringLiteral("Error"), style->standardIcon(QStyle::SP_MessageBoxCritical));
+}
+
+// --- Loading -------------------------------------------------------------------------------
+
+frmVerifier::frmVerifier(QWidget* parent) : frmVerifier(Options{}, parent) {}
+
+frmVerifier::frmVerifier(Options options, QWidget* parent)
+    : QMainWindow(parent),
+      dialogs_(std::move(options.dialogs)),
+      help_(std::move(options.help)),
+      settingsFile_(options.settingsFile) {
+    setObjectName(QStringLiteral("frmVerifier"));
+    if (!dialogs_)
+        dialogs_ = std::make_shared<QtDialogPresenter>();
+    if (!help_)
+        help_ = CreateHelpProvider(this);
+    if (settingsFile_.isEmpty())
+        settingsFile_ = DefaultSettingsFile();
+
+    BuildControls();
+    BuildMenus();
+    LoadPlacement();
+    SetRunning(false);
+
+    setWindowTitle(QString::fromLatin1(kCaption));
+    InstallPlatformHooks();
+    LibVerify::AddNotificationClient(this);
+    help_->Prepare(VTRCommon::GetAppPath() + kHelpFileName);
+    // The driver's collections exist from now on, before the first run.
+    LibVerify::BeginVerification();
+}
+
+frmVerifier::~frmVerifier() {
+    LibVerify::RemoveNotificationClient(this);
+    LibVerify::SetEventPump(nullptr);
+    ScopedMousePointer::InstallHooks(nullptr, nullptr);
+    if (g_pointer != MousePointer::Default)
+        SetScreenPointer(MousePointer::Default);
+}
+
+void frmVerifier::InstallPlatformHooks() {
+    // The core lets the user interface run its pending events after every check and inside
+    // long ones: that is where a click on Cancel arrives while a run is going.
+    LibVerify::SetEventPump([this] { PumpEvents(); });
+    ScopedMousePointer::InstallHooks([] { return g_pointer; }, &SetScreenPointer);
+}
+
+void frmVerifier::PumpEvents() {
+    if (!running_) {
+        QCoreApplication::processEvents();
+        return;
+    }
+    // During a run the core calls this after every check and result, thousands of times
+    // on a large schedule. Input is handled every time, so a click on Cancel is seen at
+    // once; the summary is brought up to date and the window drawn at most every
+    // kRepaintIntervalMs, since laying out and drawing the window costs far more than a
+    // check.
+    if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
+        repaintClock_.restart();
+        FlushLog();
+        if (summaryPending_)
+            RefreshSummary();
+        lblStatus_->setText(statusText_);
+        setUpdatesEnabled(true);
+    }
+    QCoreApplication::processEvents();
+    if (running_)
+        setUpdatesEnabled(false);
+}
+
+void frmVerifier::BuildControls() {
+    auto* central = new QWidget(this);
+    setCentralWidget(central);
+
+    // Target.
+    frameTarget_ = new QGroupBox(QStringLiteral("Target"), central);
+    frameTarget_->setObjectName(QStringLiteral("frameTarget"));
+    optTargetSequence_ = new QRadioButton(QStringLiteral("Verify a Single Sequence"), frameTarget_);
+    optTargetSequence_->setObjectName(QStringLiteral("optTargetSequence"));
+    txtTargetSequence_ = new QLineEdit(frameTarget_);
+    txtTargetSequence_->setObjectName(QStringLiteral("txtTargetSequence"));
+    txtTargetSequence_->setAccessibleName(QStringLiteral("Sequence file"));
+    cmdTargetSequence_ = new QPushButton(QStringLiteral("..."), frameTarget_);
+    cmdTargetSequence_->setObjectName(QStringLiteral("cmdTargetSequence"));
+    cmdTargetSequence_->setAccessibleName(QStringLiteral("Choose Target Sequence"));
+    cmdTargetSequence_->setToolTip(QStringLiteral("Choose the sequence file (Ctrl+O)"));
+    optTargetShow_ = new QRadioButton(QStringLiteral("Verify a Single Show"), frameTarget_);
+    optTargetShow_->setObjectName(QStringLiteral("optTargetShow"));
+    txtTargetShow_ = new QLineEdit(frameTarget_);
+    txtTargetShow_->setObjectName(QStringLiteral("txtTargetShow"));
+    txtTargetShow_->setAccessibleName(QStringLiteral("Show file"));
+    cmdTargetShow_ = new QPushButton(QStringLiteral("..."), frameTarget_);
+    cmdTargetShow_->setObjectName(QStringLiteral("cmdTargetShow"));
+    cmdTargetShow_->setAccessibleName(QStringLiteral("Choose Target Show"));
+    cmdTargetShow_->setToolTip(QStringLiteral("Choose the show file (Ctrl+O)"));
+    optTargetSchedule_ = new QRadioButton(QStringLiteral("Verify Entire Schedule"), frameTarget_);
+    optTargetSchedule_->setObjectName(QStringLiteral("optTargetSchedule"));
+    optTargetSchedule_->setChecked(true);
+    for (QPushButton* button : {cmdTargetSequence_, cmdTargetShow_})
+        button->setFixedWidth(button->fontMetrics().horizontalAdvance(QStringLiteral("....")) + 24);
+
+    auto* targetLayout = new QGridLayout(frameTarget_);
+    targetLayout->addWidget(optTargetSequence_, 0, 0);
+    targetLayout->addWidget(txtTargetSequence_, 0, 1);
+    targetLayout->addWidget(cmdTargetSequence_, 0, 2);
+    targetLayout->addWidget(optTargetShow_, 1, 0);
+    targetLayout->addWidget(txtTargetShow_, 1, 1);
+    targetLayout->addWidget(cmdTargetShow_, 1, 2);
+    targetLayout->addWidget(optTargetSchedule_, 2, 0, 1, 3);
+    targetLayout->setColumnStretch(1, 1);
+
+    // Typing a file name, or choosing one, picks its option.
+    connect(txtTargetSequence_, &QLineEdit::textEdited, optTargetSequence_,
+            [this] { optTargetSequence_->setChecked(true); });
+    connect(txtTargetShow_, &QLineEdit::textEdited, optTargetShow_,
+            [this] { optTargetShow_->setChecked(true); });
+    connect(cmdTargetSequence_, &QPushButton::clicked, this, &frmVerifier::ChooseTargetSequence);
+    connect(cmdTargetShow_, &QPushButton::clicked, this, &frmVerifier::ChooseTargetShow);
+
+    // Details.
+    sstDetails_ = new QTabWidget(central);
+    sstDetails_->setObjectName(QStringLiteral("sstDetails"));
+    rtxOutputLog_ = new QPlainTextEdit(sstDetails_);
+    rtxOutputLog_->setObjectName(QStringLiteral("rtxOutputLog"));
+    rtxOutputLog_->setReadOnly(true);
+    rtxOutputLog_->setLineWrapMode(QPlainTextEdit::NoWrap);
+    rtxOutputLog_->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOn);
+    rtxOutputLog_->setVerticalScrollBarPolicy(Qt::ScrollBarAlwaysOn);
+    rtxOutputLog_->setUndoRedoEnabled(false);
+    rtxOutputLog_->setTextInteractionFlags(Qt::TextSelectableByMouse |
+                                           Qt::TextSelectableByKeyboard);
+    // The severity colours are chosen for a light page, whatever the desktop's theme.
+    QPalette logPalette = rtxOutputLog_->palette();
+    logPalette.setColor(QPalette::Base, Qt::white);
+    logPalette.setColor(QPalette::Text, Qt::black);
+    rtxOutputLog_->setPalette(logPalette);
+    imlSeverity_ = new SeverityImageList(this);
+    lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"));
+    lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"));
+    sstDetails_->addTab(rtxOutputLog_, QStringLiteral("Output Log"));
+    sstDetails_->addTab(lvResults_[0], QStringLiteral("Results"));
+    sstDetails_->addTab(lvResults_[1], QStringLiteral("Ignored Results"));
+
+    // Summary.
+    frameSummary_ = new QGroupBox(QStringLiteral("Summary"), central);
+    frameSummary_->setObjectName(QStringLiteral("frameSummary"));
+    auto* summaryLayout = new QGridLayout(frameSummary_);
+    auto addCount = [&](const char* name, const char* caption, int row, int column) {
+        auto* label = new QLabel(QString::fromLatin1(caption), frameSummary_);
+        label->setObjectName(QString::fromLatin1(name));
+        auto* count = new QLabel(QStringLiteral("0"), frameSummary_);
+        count->setObjectName(QString::fromLatin1(name) + QStringLiteral("Count"));
+        count->setMinimumWidth(count->fontMetrics().horizontalAdvance(QStringLiteral("000000")));
+        count->setTextInteractionFlags(Qt::TextSelectableByMouse);
+        label->setBuddy(count);
+        summaryLayout->addWidget(label, row, column);
+        summaryLayout->addWidget(count, row, column + 1);
+        return count;
+    };
+    lblChecksPerformedCount_ = addCount("lblChecksPerformed", "Checks Performed:", 0, 0);
+    lblChecksRemainingCount_ = addCount("lblChecksRemaining", "Checks Remaining:", 1, 0);
+    lblErrorsCount_ = addCount("lblErrors", "Errors Detected:", 0, 2);
+    lblWarningsCount_ = addCount("lblWarnings", "Warnings Detected:", 1, 2);
+    summaryLayout->setColumnStretch(4, 1);
+    summaryLayout->setColumnMinimumWidth(4, 160);
+    summaryLayout->setHorizontalSpacing(12);
+
+    // Commands.
+    cmdHelp_ = new QPushButton(QStringLiteral("&Help"), central);
+    cmdHelp_->setObjectName(QStringLiteral("cmdHelp"));
+    cmdSave_ = new QPushButton(QStringLiteral("&Save"), central);
+    cmdSave_->setObjectName(QStringLiteral("cmdSave"));
+    cmdCancel_ = new QPushButton(QStringLiteral("&Cancel"), central);
+    cmdCancel_->setObjectName(QStringLiteral("cmdCancel"));
+    cmdVerify_ = new QPushButton(QStringLiteral("&Verify"), central);
+    cmdVerify_->setObjectName(QStringLiteral("cmdVerify"));
+    cmdHelp_->setToolTip(QStringLiteral("Help on the selected result (F1)"));
+    cmdSave_->setToolTip(QStringLiteral("Save the results to a text file (Ctrl+S)"));
+    cmdCancel_->setToolTip(QStringLiteral("Stop the verification (Esc)"));
+    cmdVerify_->setToolTip(QStringLiteral("Verify the target (F5)"));
+    connect(cmdHelp_, &QPushButton::clicked, this, &frmVerifier::Help);
+    connect(cmdSave_, &QPushButton::clicked, this, &frmVerifier::Save);
+    connect(cmdCancel_, &QPushButton::clicked, this, &frmVerifier::Cancel);
+    connect(cmdVerify_, &QPushButton::clicked, this, &frmVerifier::Verify);
+    auto* buttons = new QGridLayout;
+    buttons->addWidget(cmdHelp_, 0, 0);
+    buttons->addWidget(cmdSave_, 0, 1);
+    buttons->addWidget(cmdCancel_, 1, 0);
+    buttons->addWidget(cmdVerify_, 1, 1);
+
+    auto* bottom = new QHBoxLayout;
+    bottom->addWidget(frameSummary_, 1);
+    bottom->addLayout(buttons);
+    auto* layout = new QVBoxLayout(central);
+    layout->addWidget(frameTarget_);
+    layout->addWidget(sstDetails_, 1);
+    layout->addLayout(bottom);
+
+    // Progress of a run and the passing status text, beside the counts.
+    prgVerification_ = new QProgressBar(frameSummary_);
+    prgVerification_->setObjectName(QStringLiteral("prgVerification"));
+    prgVerification_->setRange(0, 1);
+    prgVerification_->setValue(0);
+    prgVerification_->setFormat(QStringLiteral("%v of %m checks"));
+    prgVerification_->setAccessibleName(QStringLiteral("Verification progress"));
+    lblStatus_ = new QLabel(frameSummary_);
+    lblStatus_->setObjectName(QStringLiteral("lblStatus"));
+    // A long file name must not widen the window: the text is cut to the space there is.
+    lblStatus_->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Preferred);
+    summaryLayout->addWidget(prgVerification_, 0, 4);
+    summaryLayout->addWidget(lblStatus_, 1, 4);
+
+    setAcceptDrops(true);
+    resize(900, 640);
+}
+
+QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
+    auto* list = new QTreeWidget(sstDetails_);
+    list->setObjectName(name);
+    QStringList headers{QStringLiteral("Description"), QStringLiteral("Severity"),
+                        QStringLiteral("Msg Num")};
+    for (int i = 1; i <= kDetailColumns; ++i)
+        headers.append(QStringLiteral("Details%1").arg(i));
+    list->setColumnCount(static_cast<int>(headers.size()));
+    list->setHeaderLabels(headers);
+    list->setRootIsDecorated(false);
+    list->setUniformRowHeights(true);
+    list->setAlternatingRowColors(true);
+    list->setAllColumnsShowFocus(true);
+    list->setSelectionMode(QAbstractItemView::SingleSelection);
+    list->setSelectionBehavior(QAbstractItemView::SelectRows);
+    list->setContextMenuPolicy(Qt::CustomContextMenu);
+    list->header()->setStretchLastSection(false);
+    list->setColumnWidth(DescriptionColumn, 330);
+    list->setColumnWidth(SeverityColumn, 90);
+    list->setColumnWidth(MsgNumColumn, 70);
+    for (int i = 0; i < kDetailColumns; ++i)
+        list->setColumnWidth(Details1Column + i, 240);
+    // The results stay in the order produced until a column header is clicked.
+    list->header()->setSortIndicator(-1, Qt::AscendingOrder);
+    list->setSortingEnabled(true);
+
+    connect(list, &QTreeWidget::customContextMenuRequested, this,
+            [this, list](const QPoint& position) { ShowResultPopup(list, position); });
+    connect(list, &QTreeWidget::itemDoubleClicked, this,
+            [this](QTreeWidgetItem* item) { OpenResult(ResultOf(item)); });
+    auto* open =
+        new QShortcut(QKeySequence(Qt::Key_Return), list, nullptr, nullptr, Qt::WidgetShortcut);
+    auto* openEnter =
+        new QShortcut(QKeySequence(Qt::Key_Enter), list, nullptr, nullptr, Qt::WidgetShortcut);
+    for (QShortcut* shortcut : {open, openEnter})
+        connect(shortcut, &QShortcut::activated, this,
+                [this, list] { OpenResult(SelectedResult(list)); });
+    auto* ignore = new QShortcut(QKeySequence::Delete, list, nullptr, nullptr, Qt::WidgetShortcut);
+    connect(ignore, &QShortcut::activated, this,
+            [this, list] { IgnoreResult(SelectedResult(list)); });
+    auto* ignoreNumber = new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete), list, nullptr,
+                                       nullptr, Qt::WidgetShortcut);
+    connect(ignoreNumber, &QShortcut::activated, this,
+            [this, list] { IgnoreMessageNumber(SelectedResult(list)); });
+    return list;
+}
+
+void frmVerifier::BuildMenus() {
+    mnuResultPopup_ = new QMenu(this);
+    mnuResultPopup_->setObjectName(QStringLiteral("mnuResultPopup"));
+    mnuHelpOnResult_ = mnuResultPopup_->addAction(QStringLiteral("Help on this result"));
+    mnuHelpOnResult_->setObjectName(QStringLiteral("mnuHelpOnResult"));
+    mnuHelpOnResult_->setShortcut(QKeySequence(Qt::Key_F1));
+    mnuResultPopup_->addSeparator();
+    mnuIgnoreResult_ = mnuResultPopup_->addAction(QStringLiteral("Ignore this result"));
+    mnuIgnoreResult_->setObjectName(QStringLiteral("mnuIgnoreResult"));
+    mnuIgnoreResult_->setShortcut(QKeySequence::Delete);
+    mnuIgnoreMessageNumber_ =
+        mnuResultPopup_->addAction(QStringLiteral("Ignore all results with this message number"));
+    mnuIgnoreMessageNumber_->setObjectName(QStringLiteral("mnuIgnoreMessageNumber"));
+    mnuIgnoreMessageNumber_->setShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete));
+    connect(mnuHelpOnResult_, &QAction::triggered, this, [this] { HelpOnResult(popupResult_); });
+    connect(mnuIgnoreResult_, &QAction::triggered, this, [this] { IgnoreResult(popupResult_); });
+    connect(mnuIgnoreMessageNumber_, &QAction::triggered, this,
+            [this] { IgnoreMessageNumber(popupResult_); });
+
+    // Keyboard access to the commands beyond the buttons' own letters.
+    auto addShortcut = [this](const QKeySequence& keys, auto&& command) {
+        auto* shortcut = new QShortcut(keys, this);
+        connect(shortcut, &QShortcut::activated, this, command);
+    };
+    addShortcut(QKeySequence(Qt::Key_F1), [this] {
+        if (cmdHelp_->isEnabled())
+            Help();
+    });
+    addShortcut(QKeySequence(Qt::Key_F5), [this] {
+        if (cmdVerify_->isEnabled())
+            Verify();
+    });
+    addShortcut(QKeySequence(Qt::Key_Escape), [this] {
+        if (cmdCancel_->isEnabled())
+            Cancel();
+    });
+    addShortcut(QKeySequence::Save, [this] {
+        if (cmdSave_->isEnabled())
+            Save();
+    });
+    addShortcut(QKeySequence::Open, [this] {
+        if (running_)
+            return;
+        if (optTargetSequence_->isChecked()) {
+            ChooseTargetSequence();
+        } else if (optTargetShow_->isChecked()) {
+            ChooseTargetShow();
+        }
+    });
+}
+
+// --- Placement -----------------------------------------------------------------------------
+
+void frmVerifier::LoadPlacement() {
+    const QSettings settings(settingsFile_, QSettings::IniFormat);
+    const QByteArray geometry = settings.value(kGeometryKey).toByteArray();
+    if (!geometry.isEmpty())
+        restoreGeometry(geometry);
+    txtTargetSequence_->setText(settings.value(kTargetSequenceKey).toString());
+    txtTargetShow_->setText(settings.value(kTargetShowKey).toString());
+    const QString kind = settings.value(kTargetKindKey).toString();
+    if (kind == QLatin1String("sequence")) {
+        optTargetSequence_->setChecked(true);
+    } else if (kind == QLatin1String("show")) {
+        optTargetShow_->setChecked(true);
+    } else {
+        optTargetSchedule_->setChecked(true);
+    }
+}
+
+void frmVerifier::SavePlacement() const {
+    QSettings settings(settingsFile_, QSettings::IniFormat);
+    settings.setValue(kGeometryKey, saveGeometry());
+    settings.setValue(kTargetSequenceKey, txtTargetSequence_->text());
+    settings.setValue(kTargetShowKey, txtTargetShow_->text());
+    settings.setValue(kTargetKindKey, optTargetSequence_->isChecked() ? QStringLiteral("sequence")
+                                      : optTargetShow_->isChecked()   ? QStringLiteral("show")
+                                                                      : QStringLiteral("schedule"));
+    settings.sync();
+}
+
+void frmVerifier::closeEvent(QCloseEvent* event) {
+    if (running_) {
+        // The run is on the stack below us: stop it, and close once it has ended.
+        closeWhenFinished_ = true;
+        Cancel();
+        event->ignore();
+        return;
+    }
+    SavePlacement();
+    QMainWindow::closeEvent(event);
+}
+
+// --- Dropping a file -----------------------------------------------------------------------
+
+namespace {
+
+QString DroppedFile(const QMimeData* data) {
+    if (data == nullptr || !data->hasUrls() || data->urls().size() != 1)
+        return {};
+    const QUrl url = data->urls().constFirst();
+    if (!url.isLocalFile())
+        return {};
+    const QString path = QDir::toNativeSeparators(url.toLocalFile());
+    return KindOfFile(path) == TargetKind::None ? QString() : path;
+}
+
+}  // namespace
+
+void frmVerifier::dragEnterEvent(QDragEnterEvent* event) {
+    if (!running_ && !DroppedFile(event->mimeData()).isEmpty())
+        event->acceptProposedAction();
+}
+
+void frmVerifier::dropEvent(QDropEvent* event) {
+    const QString path = DroppedFile(event->mimeData());
+    if (!path.isEmpty() && SetTargetFile(path))
+        event->acceptProposedAction();
+}
+
+bool frmVerifier::SetTargetFile(const QString& path) {
+    if (running_)
+        return false;
+    switch (KindOfFile(path)) {
+        case TargetKind::Sequence:
+            txtTargetSequence_->setText(path);
+            optTargetSequence_->setChecked(true);
+            return true;
+        case TargetKind::Show:
+            txtTargetShow_->setText(path);
+            optTargetShow_->setChecked(true);
+            return true;
+        case TargetKind::None:
+            break;
+    }
+    return false;
+}
+
+// --- States and the summary ----------------------------------------------------------------
+
+void frmVerifier::SetRunning(bool running) {
+    running_ = running;
+    if (!running) {
+        FlushLog();
+        setUpdatesEnabled(true);
+        repaintClock_.invalidate();
+        lblStatus_->setText(statusText_);
+    }
+    cmdCancel_->setEnabled(running);
+    cmdVerify_->setEnabled(!running);
+    cmdSave_->setEnabled(!running);
+    cmdHelp_->setEnabled(!running);
+    frameTarget_->setEnabled(!running);
+}
+
+void frmVerifier::ResetSummary() {
+    for (QLabel* count :
+         {lblChecksPerformedCount_, lblChecksRemainingCount_, lblErrorsCount_, lblWarningsCount_})
+        count->setText(QStringLiteral("0"));
+    prgVerification_->setRange(0, 1);
+    prgVerification_->setValue(0);
+}
+
+void frmVerifier::SummaryChanged() {
+    if (running_) {
+        summaryPending_ = true;
+    } else {
+        RefreshSummary();
+    }
+}
+
+void frmVerifier::SetStatus(const QString& text) {
+    statusText_ = text;
+    if (!running_)
+        lblStatus_->setText(text);
+}
+
+void frmVerifier::RefreshSummary() {
+    summaryPending_ = false;
+    const int32_t performed = LibVerify::ChecksPerformedCount();
+    const int32_t remaining = LibVerify::ChecksRemainingCount();
+    lblChecksPerformedCount_->setText(QString::number(performed));
+    lblChecksRemainingCount_->setText(QString::number(remaining));
+    lblErrorsCount_->setText(QString::number(LibVerify::ErrorCount()));
+    lblWarningsCount_->setText(QString::number(LibVerify::WarningCount()));
+    const int total = std::max(1, performed + remaining);
+    prgVerification_->setRange(0, total);
+    prgVerification_->setValue(std::min(performed, total));
+}
+
+// --- The output log ------------------------------------------------------------------------
+
+namespace {
+
+QColor ToQColor(const OutputLog::Colour& colour) {
+    return QColor(colour.red, colour.green, colour.blue);
+}
+
+}  // namespace
+
+QColor frmVerifier::SeverityColour(Severity severity) {
+    return ToQColor(OutputLog::ResultColour(severity));
+}
+
+void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
+    // The time stamp is taken now, whenever the line reaches the screen.
+    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), colour});
+    if (!running_)
+        FlushLog();
+}
+
+void frmVerifier::FlushLog() {
+    if (pendingLog_.isEmpty())
+        return;
+    QTextCursor cursor(rtxOutputLog_->document());
+    cursor.movePosition(QTextCursor::End);
+    cursor.beginEditBlock();
+    for (const LogLine& line : std::as_const(pendingLog_)) {
+        QTextCharFormat format;
+        format.setForeground(line.colour);
+        // Every line ends with a line break, so the document ends with an empty block.
+        cursor.insertText(line.text + QLatin1Char('\n'), format);
+    }
+    cursor.endEditBlock();
+    pendingLog_.clear();
+    // Keep the end in view.
+    QScrollBar* scrollBar = rtxOutputLog_->verticalScrollBar();
+    scrollBar->setValue(scrollBar->maximum());
+}
+
+// --- Notification handlers -----------------------------------------------------------------
+
+void frmVerifier::CheckAdded(ICheck& check) {
+    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), ToQColor(OutputLog::kBlack));
+    SummaryChanged();
+}
+
+void frmVerifier::CheckCompleted(ICheck&) {
+    SummaryChanged();
+}
+
+void frmVerifier::Checking(ICheck& check) {
+    const QString text = FromSuiteText(OutputLog::CheckingText(check));
+    WriteLog(text, ToQColor(OutputLog::kBlack));
+    SetStatus(text);
+}
+
+void frmVerifier::ChecksCompleted(bool cancelled) {
+    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), ToQColor(OutputLog::kBlack));
+    SetStatus(QString());
+    SetRunning(false);
+    RefreshSummary();
+    sstDetails_->setCurrentIndex(ResultsTab);
+}
+
+void frmVerifier::Initializing() {
+    pendingLog_.clear();
+    rtxOutputLog_->clear();
+    lvResults_[0]->clear();
+    lvResults_[1]->clear();
+    popupResult_.reset();
+    resultsListed_ = 0;
+    SetStatus(QString());
+    sstDetails_->setCurrentIndex(OutputLogTab);
+}
+
+void frmVerifier::ResultAdded(const ResultPtr& result) {
+    QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
+    AddResultItem(list, result, resultsListed_++);
+    SummaryChanged();
+    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), SeverityColour(result->Severity()));
+    LibVerify::ProcessPendingEvents();
+}
+
+void frmVerifier::TransientMessage(const std::string& message) {
+    const QString text = FromSuiteText(message);
+    WriteLog(text, ToQColor(OutputLog::kBlack));
+    SetStatus(text);
+}
+
+void frmVerifier::VerificationCancelled() {
+    SummaryChanged();
+}
+
+// --- The result lists ----------------------------------------------------------------------
+
+ResultPtr frmVerifier::ResultOf(const QTreeWidgetItem* item) {
+    const auto* resultItem = dynamic_cast<const ResultItem*>(item);
+    return resultItem != nullptr ? resultItem->Result() : nullptr;
+}
+
+void frmVerifier::AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order) {
+    auto* item = new ResultItem(result, order);
+    const QString severity = FromSuiteText(result->SeverityText());
+    item->setText(DescriptionColumn, FromSuiteText(result->Summary()));
+    item->setIcon(DescriptionColumn, imlSeverity_->Image(severity));
+    item->setText(SeverityColumn, severity);
+    item->setText(MsgNumColumn, QString::number(result->MessageNumber()));
+    QStringList details;
+    const std::vector<std::string>& resultDetails = result->Details();
+    for (std::size_t i = 0; i < resultDetails.size(); ++i) {
+        const QString detail = FromSuiteText(resultDetails[i]);
+        details.append(detail);
+        if (i < static_cast<std::size_t>(kDetailColumns))
+            item->setText(Details1Column + static_cast<int>(i), detail);
+    }
+    QString tip = item->text(DescriptionColumn);
+    if (!details.isEmpty())
+        tip += QLatin1Char('\n') + details.join(QLatin1Char('\n'));
+    item->setToolTip(DescriptionColumn, tip);
+    list->addTopLevelItem(item);
+}
+
+void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item) {
+    auto* resultItem =
+        static_cast<ResultItem*>(from->takeTopLevelItem(from->indexOfTopLevelItem(item)));
+    if (resultItem == nullptr)
+        return;
+    // Unsorted lists keep the order produced: the item goes before the first one listed
+    // after it. A sorted list places it itself.
+    int index = to->topLevelItemCount();
+    if (to->sortColumn() < 0) {
+        for (int i = 0; i < to->topLevelItemCount(); ++i) {
+            const auto* other = static_cast<const ResultItem*>(to->topLevelItem(i));
+            if (other->Order() > resultItem->Order()) {
+                index = i;
+                break;
+            }
+        }
+    }
+    to->insertTopLevelItem(index, resultItem);
+}
+
+void frmVerifier::RefreshIgnoredResults() {
+    QTreeWidget* results = lvResults_[0];
+    QTreeWidget* ignored = lvResults_[1];
+    QList<QTreeWidgetItem*> toIgnored;
+    for (int i = 0; i < results->topLevelItemCount(); ++i) {
+        const ResultPtr result = ResultOf(results->topLevelItem(i));
+        if (result && result->Ignorable())
+            toIgnored.append(results->topLevelItem(i));
+    }
+    QList<QTreeWidgetItem*> toResults;
+    for (int i = 0; i < ignored->topLevelItemCount(); ++i) {
+        const ResultPtr result = ResultOf(ignored->topLevelItem(i));
+        if (result && !result->Ignorable())
+            toResults.append(ignored->topLevelItem(i));
+    }
+    for (QTreeWidgetItem* item : toIgnored)
+        MoveItem(results, ignored, item);
+    for (QTreeWidgetItem* item : toResults)
+        MoveItem(ignored, results, item);
+}
+
+ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
+    const QList<QTreeWidgetItem*> selected = list->selectedItems();
+    if (!selected.isEmpty())
+        return ResultOf(selected.constFirst());
+    return nullptr;
+}
+
+void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
+    QTreeWidgetItem* item = list->itemAt(list->viewport()->mapFrom(list, position));
+    QPoint at = position;
+    if (item == nullptr) {
+        // From the keyboard (the menu key): the current item.
+        item = list->currentItem();
+        if (item == nullptr)
+            return;
+        at = list->viewport()->mapTo(list, list->visualItemRect(item).bottomLeft());
+    }
+    list->setCurrentItem(item);
+    popupResult_ = ResultOf(item);
+    if (!popupResult_)
+        return;
+    mnuResultPopup_->popup(list->mapToGlobal(at));
+}
+
+// --- Commands ------------------------------------------------------------------------------
+
+template <typename Command>
+void frmVerifier::Guarded(const QString& title, Command&& command) {
+    QString failure;
+    try {
+        command();
+        return;
+    } catch (const std::exception& error) {
+        failure = ErrorText(error);
+    } catch (...) {
+        failure = QStringLiteral("Unexpected error");
+    }
+    ShowError(title, failure);
+}
+
+void frmVerifier::ShowError(const QString& title, const QString& text) {
+    dialogs_->ShowError(this, title, text);
+}
+
+void frmVerifier::ApplyTarget() {
+    if (optTargetShow_->isChecked()) {
+        const QString show = txtTargetShow_->text().trimmed();
+        if (show.isEmpty())
+            Raise(ErrorNumbers::UserMessage, kSource, "Please specify the show file to verify");
+        LibVerify::VerifyShowFile(ToSuiteText(show));
+    } else if (optTargetSequence_->isChecked()) {
+        const QString sequence = txtTargetSequence_->text().trimmed();
+        if (sequence.isEmpty())
+            Raise(ErrorNumbers::UserMessage, kSource, "Please specify the sequence file to verify");
+        LibVerify::VerifySequenceFile(ToSuiteText(sequence));
+    } else {
+        LibVerify::SetScheduleFiles(VTRCommon::GetWeeklyScheduleFile(),
+                                    VTRCommon::GetYearlyScheduleFile());
+    }
+}
+
+void frmVerifier::Verify() {
+    if (running_)
+        return;
+    bool started = false;
+    Guarded(kVerifierError, [&] {
+        ScopedMousePointer pointer;
+        pointer.SetPointer(MousePointer::Hourglass);
+        ApplyTarget();
+        SetRunning(true);
+        started = true;
+        ResetSummary();
+        LibVerify::RunVerification();
+    });
+    if (!started)
+        return;
+    // ChecksCompleted has put the window back to idle; should the run have failed before
+    // it got there, do so here.
+    if (running_)
+        SetRunning(false);
+    emit VerificationFinished(LibVerify::IsCancelled());
+    if (closeWhenFinished_)
+        QTimer::singleShot(0, this, &QWidget::close);
+}
+
+void frmVerifier::Cancel() {
+    Guarded(kVerifierError, [] { LibVerify::CancelVerification(); });
+}
+
+std::string frmVerifier::ChooseResultsReportFile() {
+    const ResultsReport::DialogSettings settings = ResultsReport::ChooseResultsReportFileSettings();
+    FileDialogRequest request;
+    request.kind = FileDialogRequest::Kind::Save;
+    request.title = FromSuiteText(settings.title);
+    request.initialFolder = FromSuiteText(settings.initialFolder);
+    request.fileName = FromSuiteText(settings.fileName);
+    request.defaultExtension = FromSuiteText(settings.defaultExtension);
+    request.filters = ParseFilterList(FromSuiteText(settings.filter));
+    request.filterIndex = settings.filterIndex;
+    request.promptToOverwrite = settings.promptToOverwrite;
+    request.hideReadOnlyBox = settings.hideReadOnlyBox;
+    request.pathMustExist = settings.pathMustExist;
+    request.refuseReadOnlyFile = settings.refuseReadOnlyFile;
+    const std::optional<QString> chosen = dialogs_->ChooseFile(this, request);
+    return chosen ? ToSuiteText(*chosen) : std::string();
+}
+
+void frmVerifier::SaveResultsReport(const std::string& fileName) {
+    ResultsReport::SaveResultsReport(fileName);
+}
+
+void frmVerifier::Save() {
+    Guarded(kErrorSavingMessages, [&] {
+        const std::string fileName = ChooseResultsReportFile();
+        if (!fileName.empty())
+            SaveResultsReport(fileName);
+    });
+}
+
+void frmVerifier::Help() {
+    Guarded(kHelpFileError, [&] {
+        const int tab = sstDetails_->currentIndex();
+        ResultPtr result;
+        if (tab == ResultsTab) {
+            result = SelectedResult(lvResults_[0]);
+        } else if (tab == IgnoredResultsTab) {
+            result = SelectedResult(lvResults_[1]);
+        }
+        if (result) {
+            help_->ShowContext(result->HelpContextID());
+        } else {
+            help_->ShowPage(HelpProvider::kVerifierPage);
+        }
+    });
+}
+
+void frmVerifier::HelpOnResult(const ResultPtr& result) {
+    if (!result)
+        return;
+    Guarded(kHelpContextError, [&] { help_->ShowContext(result->HelpContextID()); });
+}
+
+void frmVerifier::OpenResult(const ResultPtr& result) {
+    if (!result)
+        return;
+    Guarded(kDoubleClickError, [&] { help_->ShowContext(result->HelpContextID()); });
+}
+
+void frmVerifier::IgnoreResult(const ResultPtr& result) {
+    if (!result)
+        return;
+    Guarded(kVerifierError, [&] {
+        IgnoreLists::IgnoreResult(*result);
+        RefreshIgnoredResults();
+    });
+}
+
+void frmVerifier::IgnoreMessageNumber(const ResultPtr& result) {
+    if (!result)
+        return;
+    Guarded(kVerifierError, [&] {
+        IgnoreLists::IgnoreMessageNumber(result->MessageNumber());
+        RefreshIgnoredResults();
+    });
+}
+
+void frmVerifier::ChooseTargetSequence() {
+    ChooseTarget(true);
+}
+
+void frmVerifier::ChooseTargetShow() {
+    ChooseTarget(false);
+}
+
+void frmVerifier::ChooseTarget(bool sequence) {
+    QLineEdit* box = sequence ? txtTargetSequence_ : txtTargetShow_;
+    QRadioButton* option = sequence ? optTargetSequence_ : optTargetShow_;
+    Guarded(sequence ? kErrorSelectingSequence : kErrorSelectingShow, [&] {
+        FileDialogRequest request;
+        request.kind = FileDialogRequest::Kind::Open;
+        request.title = sequence ? QStringLiteral("Choose Target Sequence")
+                                 : QStringLiteral("Choose Target Show");
+        if (sequence) {
+            request.filters = {{QStringLiteral("Vantori Sequence Files"),
+                                {QStringLiteral("*.las"), QStringLiteral("*.lms")}},
+                               {QStringLiteral("- Animation Sequences"), {QStringLiteral("*.las")}},
+                               {QStringLiteral("- Musical Sequences"), {QStringLiteral("*.lms")}}};
+        } else {
+            request.filters = {{QStringLiteral("Vantori Show Files"), {QStringLiteral("*.lss")}}};
+        }
+        request.filterIndex = 1;
+        request.fileMustExist = true;
+        request.pathMustExist = true;
+        request.hideReadOnlyBox = true;
+        request.refuseReadOnlyFile = true;
+        // Start where the current file is, else in the user-data folder.
+        const QFileInfo current(box->text().trimmed());
+        if (!box->text().trimmed().isEmpty() && current.absoluteDir().exists()) {
+            request.initialFolder = QDir::toNativeSeparators(current.absolutePath());
+        } else {
+            request.initialFolder = FromSuiteText(VTRCommon::GetUserDataPath());
+        }
+        const std::optional<QString> chosen = dialogs_->ChooseFile(this, request);
+        if (chosen) {
+            box->setText(*chosen);
+            option->setChecked(true);
+        }
+    });
+}
+
+}  // namespace vtr

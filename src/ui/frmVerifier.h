@@ -1,0 +1,217 @@
+#pragma once
+
+#include <QColor>
+#include <QElapsedTimer>
+#include <QHash>
+#include <QIcon>
+#include <QMainWindow>
+#include <QString>
+#include <memory>
+#include <string>
+
+#include "DialogPresenter.h"
+#include "HelpProvider.h"
+#include "engine/INotificationClient.h"
+#include "engine/Result.h"
+
+class QAction;
+class QGroupBox;
+class QLabel;
+class QLineEdit;
+class QMenu;
+class QPlainTextEdit;
+class QProgressBar;
+class QPushButton;
+class QRadioButton;
+class QTabWidget;
+class QTreeWidget;
+class QTreeWidgetItem;
+
+namespace vtr {
+
+// The three severity images of the result lists, keyed "Info", "Warning" and "Error".
+class SeverityImageList : public QObject {
+    Q_OBJECT
+  public:
+    explicit SeverityImageList(QWidget* owner);
+    // The image of a key; a null icon for any other key.
+    QIcon Image(const QString& key) const { return images_.value(key); }
+    QStringList Keys() const { return images_.keys(); }
+
+  private:
+    QHash<QString, QIcon> images_;
+};
+
+// The main window: the user chooses what to verify, starts and cancels the run, follows it
+// in the output log, reads the results and the ignored results, ignores results, opens
+// help on a result and saves the results report. Everything the run changes on it arrives
+// through its notification handlers.
+//
+// Controls carry their names as object names ("cmdVerify", "lvResults1", "lvResults2",
+// ...), so that tests and accessibility tools can find them.
+class frmVerifier : public QMainWindow, public INotificationClient {
+    Q_OBJECT
+  public:
+    struct Options {
+        // Message boxes and file dialogs; the Qt dialogs when not given.
+        std::shared_ptr<DialogPresenter> dialogs;
+        // The help of this platform when not given.
+        std::unique_ptr<HelpProvider> help;
+        // Where the window keeps its size, position and last target (an INI file); the
+        // per-user default of the program when empty. Never the suite's settings store.
+        QString settingsFile;
+    };
+
+    // The tabs of sstDetails, in order.
+    enum Tab { OutputLogTab = 0, ResultsTab = 1, IgnoredResultsTab = 2 };
+    // The columns of both result lists.
+    enum Column { DescriptionColumn = 0, SeverityColumn = 1, MsgNumColumn = 2, Details1Column = 3 };
+
+    // Loads the window: caption, notification client, help, the event pump and busy pointer
+    // hooks, and the driver's collections (BeginVerification once).
+    explicit frmVerifier(Options options, QWidget* parent = nullptr);
+    explicit frmVerifier(QWidget* parent = nullptr);
+    ~frmVerifier() override;
+
+    // --- Notification handlers ---------------------------------------------------------
+    void CheckAdded(ICheck& check) override;
+    void CheckCompleted(ICheck& check) override;
+    void Checking(ICheck& check) override;
+    void ChecksCompleted(bool cancelled) override;
+    void Initializing() override;
+    void ResultAdded(const ResultPtr& result) override;
+    void TransientMessage(const std::string& message) override;
+    void VerificationCancelled() override;
+
+    // --- Commands ---------------------------------------------------------------------
+    // cmdVerify: applies the target and runs the verification (returns when it ended).
+    void Verify();
+    // cmdCancel: cancels the running verification.
+    void Cancel();
+    // cmdSave: asks for the report's file name and saves the report there.
+    void Save();
+    // cmdHelp: help on the selected result of the tab shown, else the verifier's page.
+    void Help();
+    // cmdTargetSequence / cmdTargetShow: the open-file dialogs of the target.
+    void ChooseTargetSequence();
+    void ChooseTargetShow();
+    // The pop-up menu's commands for the result of an item of either list.
+    void HelpOnResult(const ResultPtr& result);
+    void IgnoreResult(const ResultPtr& result);
+    void IgnoreMessageNumber(const ResultPtr& result);
+    // A double-click (or Enter) on an item: help on its result.
+    void OpenResult(const ResultPtr& result);
+
+    // Chooses a file as the target by its kind: "lss" a show, "las"/"lms" a sequence
+    // (any letter case). False, with nothing changed, for anything else or while running.
+    bool SetTargetFile(const QString& path);
+
+    // The report dialog: the chosen file name, or "" when the user cancelled.
+    std::string ChooseResultsReportFile();
+    // Writes the report of the last run (raises VtrError on failure).
+    void SaveResultsReport(const std::string& fileName);
+
+    // Moves every listed result to the list its Ignorable now calls for.
+    void RefreshIgnoredResults();
+    // Sets the four count labels from the driver's counts.
+    void RefreshSummary();
+    // Writes one line to the output log: time stamp, ": ", the text, in that colour.
+    void WriteLog(const QString& text, const QColor& colour);
+
+    // The log colour of a severity: Info blue, Warning orange, Error red, others black.
+    static QColor SeverityColour(Severity severity);
+    // The result behind a list item (the item's tag); null for anything else.
+    static ResultPtr ResultOf(const QTreeWidgetItem* item);
+
+    bool IsRunning() const { return running_; }
+
+  signals:
+    // A verification started by Verify ended (after the window went back to idle).
+    void VerificationFinished(bool cancelled);
+
+  protected:
+    void closeEvent(QCloseEvent* event) override;
+    void dragEnterEvent(QDragEnterEvent* event) override;
+    void dropEvent(QDropEvent* event) override;
+
+  private:
+    void BuildControls();
+    QTreeWidget* BuildResultList(const QString& name);
+    void BuildMenus();
+    void InstallPlatformHooks();
+    // The event pump the core calls while a run goes.
+    void PumpEvents();
+    void LoadPlacement();
+    void SavePlacement() const;
+
+    void SetRunning(bool running);
+    // The summary and the status text changed: shown at once when idle, at the next
+    // drawing of the window while a run goes.
+    void SummaryChanged();
+    void SetStatus(const QString& text);
+    // Writes the log lines kept back while a run goes.
+    void FlushLog();
+    void ResetSummary();
+    void ApplyTarget();
+    void ChooseTarget(bool sequence);
+    void AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order);
+    void MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item);
+    void ShowResultPopup(QTreeWidget* list, const QPoint& position);
+    ResultPtr SelectedResult(const QTreeWidget* list) const;
+    // Runs a command; a failure is shown in a message box with that title.
+    template <typename Command>
+    void Guarded(const QString& title, Command&& command);
+    void ShowError(const QString& title, const QString& text);
+
+    std::shared_ptr<DialogPresenter> dialogs_;
+    std::unique_ptr<HelpProvider> help_;
+    QString settingsFile_;
+
+    // Target.
+    QGroupBox* frameTarget_ = nullptr;
+    QRadioButton* optTargetSequence_ = nullptr;
+    QLineEdit* txtTargetSequence_ = nullptr;
+    QPushButton* cmdTargetSequence_ = nullptr;
+    QRadioButton* optTargetShow_ = nullptr;
+    QLineEdit* txtTargetShow_ = nullptr;
+    QPushButton* cmdTargetShow_ = nullptr;
+    QRadioButton* optTargetSchedule_ = nullptr;
+    // Details.
+    QTabWidget* sstDetails_ = nullptr;
+    QPlainTextEdit* rtxOutputLog_ = nullptr;
+    QTreeWidget* lvResults_[2] = {nullptr, nullptr};
+    SeverityImageList* imlSeverity_ = nullptr;
+    // Summary.
+    QGroupBox* frameSummary_ = nullptr;
+    QLabel* lblChecksPerformedCount_ = nullptr;
+    QLabel* lblChecksRemainingCount_ = nullptr;
+    QLabel* lblErrorsCount_ = nullptr;
+    QLabel* lblWarningsCount_ = nullptr;
+    QProgressBar* prgVerification_ = nullptr;
+    QLabel* lblStatus_ = nullptr;
+    // Commands.
+    QPushButton* cmdHelp_ = nullptr;
+    QPushButton* cmdSave_ = nullptr;
+    QPushButton* cmdCancel_ = nullptr;
+    QPushButton* cmdVerify_ = nullptr;
+    QMenu* mnuResultPopup_ = nullptr;
+    QAction* mnuHelpOnResult_ = nullptr;
+    QAction* mnuIgnoreResult_ = nullptr;
+    QAction* mnuIgnoreMessageNumber_ = nullptr;
+    ResultPtr popupResult_;  // the result the pop-up menu was opened on
+
+    static constexpr qint64 kRepaintIntervalMs = 50;
+    QElapsedTimer repaintClock_;
+    bool summaryPending_ = false;
+    struct LogLine {
+        QString text;
+        QColor colour;
+    };
+    QList<LogLine> pendingLog_;
+    QString statusText_;
+    bool running_ = false;
+    bool closeWhenFinished_ = false;
+    qint64 resultsListed_ = 0;  // the order of the next result listed
+};
+
+}  // namespace vtr

@@ -1,0 +1,924 @@
+// The main window, driven as a user drives it, on a suite installation built in a temporary
+// folder with its own settings store, window settings file, temporary folder and clock.
+#include <QAbstractButton>
+#include <QApplication>
+#include <QGroupBox>
+#include <QHeaderView>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMenu>
+#include <QMimeData>
+#include <QPlainTextEdit>
+#include <QProgressBar>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QSignalSpy>
+#include <QTabWidget>
+#include <QTextBlock>
+#include <QTreeWidget>
+#include <QtTest>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <memory>
+
+#include "ChmWriter.h"
+#include "HelpViewer.h"
+#include "UiTestMain.h"
+#include "engine/IgnoreLists.h"
+#include "engine/LibVerify.h"
+#include "engine/VtrError.h"
+#include "environment/VTRCommon.h"
+#include "frmVerifier.h"
+#include "schedule/DateTime.h"
+#include "support/TempStore.h"
+
+using vtr::FileDialogRequest;
+using vtr::FileFilter;
+using vtr::frmVerifier;
+using vtr::ResultPtr;
+using vtr::Severity;
+namespace LibVerify = vtr::LibVerify;
+namespace fs = std::filesystem;
+
+namespace {
+
+// Message boxes and file dialogs, written down instead of shown; file dialogs answer what
+// the test says (cancel unless told otherwise).
+class RecordingPresenter : public vtr::DialogPresenter {
+  public:
+    struct Box {
+        QString title;
+        QString text;
+        bool operator==(const Box&) const = default;
+    };
+    QList<Box> boxes;
+    QList<FileDialogRequest> requests;
+    std::function<std::optional<QString>(const FileDialogRequest&)> answer;
+
+    void ShowError(QWidget*, const QString& title, const QString& text) override {
+        boxes.append({title, text});
+    }
+    std::optional<QString> ChooseFile(QWidget*, const FileDialogRequest& request) override {
+        requests.append(request);
+        return answer ? answer(request) : std::nullopt;
+    }
+};
+
+// A second notification client, registered after the window, that lets a test act while a
+// run is going.
+class Watcher : public vtr::INotificationClient {
+  public:
+    Watcher() { LibVerify::AddNotificationClient(this); }
+    ~Watcher() override { LibVerify::RemoveNotificationClient(this); }
+
+    void CheckAdded(vtr::ICheck&) override {}
+    void CheckCompleted(vtr::ICheck&) override {
+        ++completed;
+        if (onCompleted)
+            onCompleted(completed);
+    }
+    void Checking(vtr::ICheck&) override {
+        if (onChecking)
+            onChecking();
+    }
+    void ChecksCompleted(bool) override {}
+    void Initializing() override { ++initializing; }
+    void ResultAdded(const ResultPtr&) override {}
+    void TransientMessage(const std::string&) override {}
+    void VerificationCancelled() override {}
+
+    int completed = 0;
+    int initializing = 0;
+    std::function<void(int completed)> onCompleted;
+    std::function<void()> onChecking;
+};
+
+// The same moment for every time stamp: 24 December 2024, 3:07:09 in the afternoon.
+vtr::DateTime FixedNow() {
+    return vtr::DateTime::FromParts(2024, 12, 24, 15, 7, 9);
+}
+const QString kStamp = QStringLiteral("3:07:09 PM: ");
+
+QStringList ListTexts(const QTreeWidget* list, int column = frmVerifier::DescriptionColumn) {
+    QStringList texts;
+    for (int i = 0; i < list->topLevelItemCount(); ++i)
+        texts.append(list->topLevelItem(i)->text(column));
+    return texts;
+}
+
+QTreeWidgetItem* ItemOf(const QTreeWidget* list, const ResultPtr& result) {
+    for (int i = 0; i < list->topLevelItemCount(); ++i) {
+        if (frmVerifier::ResultOf(list->topLevelItem(i)) == result)
+            return list->topLevelItem(i);
+    }
+    return nullptr;
+}
+
+// A point on an item's description, in the list's viewport.
+QPoint OnItem(const QTreeWidget* list, QTreeWidgetItem* item) {
+    const QRect rect = list->visualItemRect(item);
+    return QPoint(rect.left() + 20, rect.center().y());
+}
+
+// A double-click on an item, as the system delivers it: press, release, then the double
+// click itself.
+void DoubleClick(QTreeWidget* list, QTreeWidgetItem* item) {
+    const QPointF at = OnItem(list, item);
+    const QPointF global = list->viewport()->mapToGlobal(at);
+    for (QEvent::Type type : {QEvent::MouseButtonPress, QEvent::MouseButtonRelease,
+                              QEvent::MouseButtonDblClick, QEvent::MouseButtonRelease}) {
+        QMouseEvent event(type, at, global, Qt::LeftButton,
+                          type == QEvent::MouseButtonRelease ? Qt::NoButton : Qt::LeftButton,
+                          Qt::NoModifier);
+        QApplication::sendEvent(list->viewport(), &event);
+    }
+}
+
+}  // namespace
+
+class FrmVerifierTest : public QObject {
+    Q_OBJECT
+
+  private slots:
+    void init();
+    void cleanup();
+
+    void loadsWithEveryControlAndBegins();
+    void emptyTargetShowsItsMessageAndStartsNothing();
+    void runFillsTheListsAndCounters();
+    void runOnTheDemoInstallation();
+    void cancelTakesEffectWhileTheRunGoes();
+    void cancelFromTheKeyboard();
+    void closingDuringARunCancelsItFirst();
+    void resultsAreListedAndLoggedInTheirColours();
+    void ignoredResultsAreListedApartAndStillLogged();
+    void ignoringMovesTheListedResults();
+    void resultListsSortByValue();
+    void saveAsksForTheReportFileAndWritesIt();
+    void targetDialogsAndTheirFailures();
+    void filtersInTheDialogsNotation();
+    void helpOnResultsAndOnTheVerifier();
+    void placementAndTargetAreRemembered();
+    void aDroppedFileBecomesTheTarget();
+    void keyboardReachesTheCommands();
+
+  private:
+    template <typename T>
+    T* Find(const char* name) const {
+        T* found = window_->findChild<T*>(QString::fromLatin1(name));
+        if (found == nullptr)
+            qFatal("no control %s", name);
+        return found;
+    }
+    QTreeWidget* Results() const { return Find<QTreeWidget>("lvResults1"); }
+    QTreeWidget* Ignored() const { return Find<QTreeWidget>("lvResults2"); }
+    QStringList LogLines() const;
+    QColor LogLineColour(int fromEnd) const;
+    void Click(const char* button) const {
+        QTest::mouseClick(Find<QPushButton>(button), Qt::LeftButton);
+    }
+    void ExpectIdle() const;
+    std::unique_ptr<frmVerifier> MakeWindow();
+    void ShowActive();
+    std::string AppFolder() const { return folder_->File("app"); }
+    std::string DataFolder() const { return folder_->File("data"); }
+    std::vector<std::string> TemporaryFiles() const;
+
+    std::unique_ptr<vtr::testsupport::TempFolder> folder_;
+    std::unique_ptr<vtr::testsupport::ScopedStore> store_;
+    std::unique_ptr<vtr::testsupport::ScopedEnvironment> tmpdir_;
+    std::unique_ptr<vtr::ScopedNowSource> clock_;
+    std::shared_ptr<RecordingPresenter> dialogs_;
+    std::unique_ptr<frmVerifier> window_;
+    std::string storeText_;
+};
+
+// Every test: an installed suite whose application folder is empty (so every application
+// file is missing) and whose user-data folder holds no schedule.
+void FrmVerifierTest::init() {
+    folder_ = std::make_unique<vtr::testsupport::TempFolder>();
+    fs::create_directories(AppFolder());
+    fs::create_directories(DataFolder());
+    fs::create_directories(folder_->File("tmp"));
+    storeText_ =
+        "Windows Registry Editor Version 5.00\r\n\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared]\r\n"
+        "\"AppPath\"=\"" +
+        AppFolder() +
+        "\"\r\n"
+        "\"UserDataPath\"=\"" +
+        DataFolder() +
+        "\"\r\n"
+        "\"PostInstall\"=dword:00000001\r\n"
+        "\"PostInstallVer\"=dword:00000035\r\n";
+    vtr::testsupport::WriteFileBytes(folder_->File("registry.reg"), storeText_);
+    store_ = std::make_unique<vtr::testsupport::ScopedStore>(folder_->File("registry.reg"));
+    tmpdir_ = std::make_unique<vtr::testsupport::ScopedEnvironment>("TMPDIR", folder_->File("tmp"));
+    clock_ = std::make_unique<vtr::ScopedNowSource>(&FixedNow);
+    dialogs_ = std::make_shared<RecordingPresenter>();
+    window_ = MakeWindow();
+    ShowActive();
+}
+
+// Shown and active, as the user has it: keys reach the focused control, lists lay out.
+void FrmVerifierTest::ShowActive() {
+    window_->show();
+    QVERIFY(QTest::qWaitForWindowExposed(window_.get()));
+    window_->activateWindow();
+    QVERIFY(QTest::qWaitForWindowActive(window_.get()));
+}
+
+void FrmVerifierTest::cleanup() {
+    window_.reset();
+    dialogs_.reset();
+    clock_.reset();
+    tmpdir_.reset();
+    store_.reset();
+    folder_.reset();
+}
+
+std::unique_ptr<frmVerifier> FrmVerifierTest::MakeWindow() {
+    frmVerifier::Options options;
+    options.dialogs = dialogs_;
+    options.settingsFile = QString::fromStdString(folder_->File("window.ini"));
+    return std::make_unique<frmVerifier>(std::move(options));
+}
+
+QStringList FrmVerifierTest::LogLines() const {
+    QStringList lines =
+        Find<QPlainTextEdit>("rtxOutputLog")->toPlainText().split(QLatin1Char('\n'));
+    // Every line ends with a break: the text ends with an empty line.
+    if (!lines.isEmpty() && lines.constLast().isEmpty())
+        lines.removeLast();
+    return lines;
+}
+
+QColor FrmVerifierTest::LogLineColour(int fromEnd) const {
+    QTextBlock block = Find<QPlainTextEdit>("rtxOutputLog")->document()->lastBlock();
+    for (int i = 0; i <= fromEnd; ++i)
+        block = block.previous();
+    return block.begin().fragment().charFormat().foreground().color();
+}
+
+void FrmVerifierTest::ExpectIdle() const {
+    QVERIFY(Find<QPushButton>("cmdVerify")->isEnabled());
+    QVERIFY(Find<QPushButton>("cmdSave")->isEnabled());
+    QVERIFY(Find<QPushButton>("cmdHelp")->isEnabled());
+    QVERIFY(!Find<QPushButton>("cmdCancel")->isEnabled());
+    QVERIFY(!window_->IsRunning());
+}
+
+std::vector<std::string> FrmVerifierTest::TemporaryFiles() const {
+    std::vector<std::string> names;
+    for (const auto& entry : fs::directory_iterator(folder_->File("tmp")))
+        names.push_back(entry.path().filename().string());
+    return names;
+}
+
+void FrmVerifierTest::loadsWithEveryControlAndBegins() {
+    QCOMPARE(window_->windowTitle(), QStringLiteral("Vantori Verifier"));
+    QCOMPARE(window_->objectName(), QStringLiteral("frmVerifier"));
+    QVERIFY(Find<QGroupBox>("frameTarget"));
+    QCOMPARE(Find<QRadioButton>("optTargetSequence")->text(),
+             QStringLiteral("Verify a Single Sequence"));
+    QCOMPARE(Find<QRadioButton>("optTargetShow")->text(), QStringLiteral("Verify a Single Show"));
+    QCOMPARE(Find<QRadioButton>("optTargetSchedule")->text(),
+             QStringLiteral("Verify Entire Schedule"));
+    QVERIFY(Find<QRadioButton>("optTargetSchedule")->isChecked());
+    QVERIFY(Find<QLineEdit>("txtTargetSequence")->text().isEmpty());
+    QVERIFY(Find<QLineEdit>("txtTargetShow")->text().isEmpty());
+    QVERIFY(Find<QPushButton>("cmdTargetSequence"));
+    QVERIFY(Find<QPushButton>("cmdTargetShow"));
+
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    QCOMPARE(tabs->count(), 3);
+    QCOMPARE(tabs->tabText(0), QStringLiteral("Output Log"));
+    QCOMPARE(tabs->tabText(1), QStringLiteral("Results"));
+    QCOMPARE(tabs->tabText(2), QStringLiteral("Ignored Results"));
+    QCOMPARE(tabs->widget(0), Find<QPlainTextEdit>("rtxOutputLog"));
+    QCOMPARE(tabs->widget(1), Results());
+    QCOMPARE(tabs->widget(2), Ignored());
+    QVERIFY(Find<QPlainTextEdit>("rtxOutputLog")->isReadOnly());
+
+    QStringList columns{QStringLiteral("Description"), QStringLiteral("Severity"),
+                        QStringLiteral("Msg Num")};
+    for (int i = 1; i <= 9; ++i)
+        columns.append(QStringLiteral("Details%1").arg(i));
+    for (QTreeWidget* list : {Results(), Ignored()}) {
+        QCOMPARE(list->columnCount(), 12);
+        QStringList headers;
+        for (int i = 0; i < list->columnCount(); ++i)
+            headers.append(list->headerItem()->text(i));
+        QCOMPARE(headers, columns);
+    }
+    auto* images = window_->findChild<vtr::SeverityImageList*>(QStringLiteral("imlSeverity"));
+    QVERIFY(images != nullptr);
+    QStringList keys = images->Keys();
+    keys.sort();
+    QCOMPARE(keys, (QStringList{QStringLiteral("Error"), QStringLiteral("Info"),
+                                QStringLiteral("Warning")}));
+    for (const QString& key : keys)
+        QVERIFY(!images->Image(key).isNull());
+
+    QCOMPARE(Find<QGroupBox>("frameSummary")->title(), QStringLiteral("Summary"));
+    QCOMPARE(Find<QLabel>("lblChecksPerformed")->text(), QStringLiteral("Checks Performed:"));
+    QCOMPARE(Find<QLabel>("lblChecksRemaining")->text(), QStringLiteral("Checks Remaining:"));
+    QCOMPARE(Find<QLabel>("lblErrors")->text(), QStringLiteral("Errors Detected:"));
+    QCOMPARE(Find<QLabel>("lblWarnings")->text(), QStringLiteral("Warnings Detected:"));
+    QCOMPARE(Find<QPushButton>("cmdHelp")->text(), QStringLiteral("&Help"));
+    QCOMPARE(Find<QPushButton>("cmdSave")->text(), QStringLiteral("&Save"));
+    QCOMPARE(Find<QPushButton>("cmdCancel")->text(), QStringLiteral("&Cancel"));
+    QCOMPARE(Find<QPushButton>("cmdVerify")->text(), QStringLiteral("&Verify"));
+
+    const QList<QAction*> popup = Find<QMenu>("mnuResultPopup")->actions();
+    QCOMPARE(popup.size(), 4);
+    QCOMPARE(popup[0]->text(), QStringLiteral("Help on this result"));
+    QVERIFY(popup[1]->isSeparator());
+    QCOMPARE(popup[2]->text(), QStringLiteral("Ignore this result"));
+    QCOMPARE(popup[3]->text(), QStringLiteral("Ignore all results with this message number"));
+    ExpectIdle();
+
+    // Loaded: registered with the driver, and BeginVerification ran once, queueing the three
+    // root checks, which the log and the summary show.
+    QCOMPARE(LibVerify::ChecksRemainingCount(), 3);
+    QCOMPARE(Find<QLabel>("lblChecksRemainingCount")->text(), QStringLiteral("3"));
+    QCOMPARE(
+        LogLines().filter(QRegularExpression(QStringLiteral("^3:07:09 PM: Adding check: "))).size(),
+        3);
+    LibVerify::PostTransientMessage("Loading sequence: 40%");
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Loading sequence: 40%"));
+    QCOMPARE(LogLineColour(0), QColor(0, 0, 0));
+}
+
+void FrmVerifierTest::emptyTargetShowsItsMessageAndStartsNothing() {
+    Watcher watcher;
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("   "));
+    Click("cmdVerify");
+    Find<QRadioButton>("optTargetSequence")->setChecked(true);
+    Click("cmdVerify");
+    QCOMPARE(dialogs_->boxes, (QList<RecordingPresenter::Box>{
+                                  {QStringLiteral("Verifier Error"),
+                                   QStringLiteral("Please specify the show file to verify")},
+                                  {QStringLiteral("Verifier Error"),
+                                   QStringLiteral("Please specify the sequence file to verify")}}));
+    QCOMPARE(watcher.initializing, 0);
+    QCOMPARE(watcher.completed, 0);
+    ExpectIdle();
+    QVERIFY(TemporaryFiles().empty());
+    QVERIFY(QApplication::overrideCursor() == nullptr);
+}
+
+void FrmVerifierTest::runFillsTheListsAndCounters() {
+    const std::string show = folder_->File("Missing Show.lss");
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QString::fromStdString(show));
+    QSignalSpy finished(window_.get(), &frmVerifier::VerificationFinished);
+    Click("cmdVerify");
+
+    QCOMPARE(finished.size(), 1);
+    QCOMPARE(finished.constFirst().constFirst().toBool(), false);
+    ExpectIdle();
+    QCOMPARE(Find<QTabWidget>("sstDetails")->currentIndex(), int(frmVerifier::ResultsTab));
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Verification completed"));
+    QVERIFY(LogLines().contains(kStamp + QStringLiteral("Show file does not exist: ") +
+                                QString::fromStdString(show)));
+
+    // Lists and counters agree with the driver's collections.
+    QCOMPARE(Results()->topLevelItemCount(), int(LibVerify::GetResults().size()));
+    QCOMPARE(Ignored()->topLevelItemCount(), 0);
+    for (std::size_t i = 0; i < LibVerify::GetResults().size(); ++i)
+        QCOMPARE(frmVerifier::ResultOf(Results()->topLevelItem(int(i))),
+                 LibVerify::GetResults()[i]);
+    QVERIFY(ListTexts(Results()).contains(QStringLiteral("Show file does not exist")));
+    QVERIFY(ListTexts(Results()).contains(QStringLiteral("Application file does not exist")));
+    QVERIFY(LibVerify::ErrorCount() > 1);
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QString::number(LibVerify::ErrorCount()));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QString::number(LibVerify::WarningCount()));
+    QVERIFY(LibVerify::ChecksPerformedCount() > 10);
+    QCOMPARE(Find<QLabel>("lblChecksPerformedCount")->text(),
+             QString::number(LibVerify::ChecksPerformedCount()));
+    QCOMPARE(Find<QLabel>("lblChecksRemainingCount")->text(), QStringLiteral("0"));
+    auto* progress = Find<QProgressBar>("prgVerification");
+    QCOMPARE(progress->maximum(), LibVerify::ChecksPerformedCount());
+    QCOMPARE(progress->value(), progress->maximum());
+
+    // The show was wrapped in temporary schedules, and none is left; the busy pointer is gone.
+    QVERIFY(TemporaryFiles().empty());
+    QVERIFY(QApplication::overrideCursor() == nullptr);
+    // The settings store was only read.
+    QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg")), storeText_);
+}
+
+void FrmVerifierTest::runOnTheDemoInstallation() {
+    const std::string demoStore = std::string(VTR_BINARY_DIR) + "/demo/registry.reg";
+    if (!fs::exists(demoStore))
+        QSKIP("the demo installation is not in the build folder");
+    // A copy of the demo's store, so that nothing the window does reaches the demo.
+    fs::copy_file(demoStore, folder_->File("demo.reg"));
+    window_.reset();
+    vtr::testsupport::ScopedStore demo(folder_->File("demo.reg"));
+    window_ = MakeWindow();
+    ShowActive();
+    Click("cmdVerify");  // the entire schedule
+    ExpectIdle();
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Verification completed"));
+    QVERIFY(Results()->topLevelItemCount() > 0);
+    QCOMPARE(Results()->topLevelItemCount(), int(LibVerify::GetResults().size()));
+    QCOMPARE(Ignored()->topLevelItemCount(), int(LibVerify::GetIgnoredResults().size()));
+    QVERIFY(LibVerify::ChecksPerformedCount() > 20);
+    QCOMPARE(Find<QLabel>("lblChecksPerformedCount")->text(),
+             QString::number(LibVerify::ChecksPerformedCount()));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QString::number(LibVerify::ErrorCount()));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QString::number(LibVerify::WarningCount()));
+    QVERIFY(LibVerify::ErrorCount() + LibVerify::WarningCount() > 0);
+#ifndef _WIN32
+    // Help on a result opens its page of the demo's help file, found by its help-context id.
+    const ResultPtr first = frmVerifier::ResultOf(Results()->topLevelItem(0));
+    Results()->setCurrentItem(Results()->topLevelItem(0));
+    Click("cmdHelp");
+    auto* viewer = window_->findChild<vtr::HelpViewer*>(QStringLiteral("HelpViewer"));
+    QVERIFY(viewer != nullptr);
+    QCOMPARE(viewer->CurrentPage(),
+             QStringLiteral("/messages/msg%1.htm").arg(first->MessageNumber()));
+    QVERIFY(dialogs_->boxes.isEmpty());
+#endif
+    QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("demo.reg")),
+             vtr::testsupport::ReadFileBytes(demoStore));
+    window_.reset();
+}
+
+void FrmVerifierTest::cancelTakesEffectWhileTheRunGoes() {
+    Watcher watcher;
+    bool runningState = false;
+    Qt::CursorShape pointer = Qt::ArrowCursor;
+    watcher.onChecking = [&] {
+        runningState = Find<QPushButton>("cmdCancel")->isEnabled() &&
+                       !Find<QPushButton>("cmdVerify")->isEnabled() &&
+                       !Find<QPushButton>("cmdSave")->isEnabled() &&
+                       !Find<QPushButton>("cmdHelp")->isEnabled() && window_->IsRunning();
+        if (QApplication::overrideCursor() != nullptr)
+            pointer = QApplication::overrideCursor()->shape();
+    };
+    // The click arrives as a user's would: queued, and seen when the core lets the window
+    // process its events after the second check.
+    watcher.onCompleted = [&](int completed) {
+        if (completed == 2)
+            QMetaObject::invokeMethod(Find<QPushButton>("cmdCancel"), "click",
+                                      Qt::QueuedConnection);
+    };
+    QSignalSpy finished(window_.get(), &frmVerifier::VerificationFinished);
+    Click("cmdVerify");
+
+    QVERIFY(runningState);
+    QCOMPARE(pointer, Qt::WaitCursor);
+    QVERIFY(QApplication::overrideCursor() == nullptr);
+    QCOMPARE(finished.size(), 1);
+    QCOMPARE(finished.constFirst().constFirst().toBool(), true);
+    ExpectIdle();
+    QCOMPARE(watcher.completed, 2);
+    QCOMPARE(LibVerify::ChecksPerformedCount(), 2);
+    QCOMPARE(LibVerify::ChecksRemainingCount(), 0);
+    QCOMPARE(Find<QLabel>("lblChecksRemainingCount")->text(), QStringLiteral("0"));
+    QCOMPARE(LogLines().constLast(),
+             kStamp + QStringLiteral("Stopping verification due to cancellation"));
+    QVERIFY(LogLines().contains(kStamp + QStringLiteral("Verification cancelled")));
+    QVERIFY(ListTexts(Results()).contains(QStringLiteral("Verification cancelled")));
+    QVERIFY(!ListTexts(Results()).contains(QStringLiteral("No errors or warnings found")));
+    QCOMPARE(Find<QTabWidget>("sstDetails")->currentIndex(), int(frmVerifier::ResultsTab));
+}
+
+void FrmVerifierTest::cancelFromTheKeyboard() {
+    Watcher watcher;
+    watcher.onCompleted = [&](int completed) {
+        if (completed == 1)
+            QMetaObject::invokeMethod(
+                window_.get(), [this] { QTest::keyClick(window_.get(), Qt::Key_Escape); },
+                Qt::QueuedConnection);
+    };
+    QTest::keyClick(window_.get(), Qt::Key_F5);  // Verify
+    QCOMPARE(watcher.completed, 1);
+    QCOMPARE(LogLines().constLast(),
+             kStamp + QStringLiteral("Stopping verification due to cancellation"));
+    ExpectIdle();
+}
+
+void FrmVerifierTest::closingDuringARunCancelsItFirst() {
+    Watcher watcher;
+    watcher.onCompleted = [&](int completed) {
+        if (completed == 1)
+            QMetaObject::invokeMethod(window_.get(), &QWidget::close, Qt::QueuedConnection);
+    };
+    Click("cmdVerify");
+    // The run ended through cancellation; then the window closed.
+    QCOMPARE(watcher.completed, 1);
+    QVERIFY(ListTexts(Results()).contains(QStringLiteral("Verification cancelled")));
+    QTRY_VERIFY(!window_->isVisible());
+    QVERIFY(fs::exists(folder_->File("window.ini")));
+}
+
+void FrmVerifierTest::resultsAreListedAndLoggedInTheirColours() {
+    const ResultPtr warning =
+        LibVerify::AddResult(Severity::Warning, "Channel conflict", 43, 43, {"A", "B"});
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Channel conflict: A / B"));
+    QCOMPARE(LogLineColour(0), QColor(255, 128, 0));
+    const ResultPtr info =
+        LibVerify::AddResult(Severity::Info, "No errors or warnings found", 1, 1);
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("No errors or warnings found"));
+    QCOMPARE(LogLineColour(0), QColor(0, 0, 255));
+    const ResultPtr error =
+        LibVerify::AddResult(Severity::Error, "Show file does not exist", 21, 21, {"", "x.lss"});
+    QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Show file does not exist: x.lss"));
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+    const ResultPtr odd = LibVerify::AddResult(static_cast<Severity>(7), "Odd", 99, 98,
+                                               {"1", "2", "3", "4", "5", "6", "7", "8", "9"});
+    QCOMPARE(LogLines().constLast(),
+             kStamp + QStringLiteral("Odd: 1 / 2 / 3 / 4 / 5 / 6 / 7 / 8 / 9"));
+    QCOMPARE(LogLineColour(0), QColor(0, 0, 0));
+    // Earlier lines keep their colours.
+    QCOMPARE(LogLineColour(3), QColor(255, 128, 0));
+
+    QTreeWidget* list = Results();
+    QCOMPARE(list->topLevelItemCount(), 4);
+    QTreeWidgetItem* item = list->topLevelItem(0);
+    QCOMPARE(frmVerifier::ResultOf(item), warning);
+    QStringList texts;
+    for (int column = 0; column < 12; ++column)
+        texts.append(item->text(column));
+    QCOMPARE(texts, (QStringList{QStringLiteral("Channel conflict"),
+                                 QStringLiteral("Warning"),
+                                 QStringLiteral("43"),
+                                 QStringLiteral("A"),
+                                 QStringLiteral("B"),
+                                 {},
+                                 {},
+                                 {},
+                                 {},
+                                 {},
+                                 {},
+                                 {}}));
+    auto* images = window_->findChild<vtr::SeverityImageList*>(QStringLiteral("imlSeverity"));
+    QCOMPARE(item->icon(0).cacheKey(), images->Image(QStringLiteral("Warning")).cacheKey());
+    QCOMPARE(list->topLevelItem(1)->icon(0).cacheKey(),
+             images->Image(QStringLiteral("Info")).cacheKey());
+    QCOMPARE(list->topLevelItem(2)->icon(0).cacheKey(),
+             images->Image(QStringLiteral("Error")).cacheKey());
+    QCOMPARE(list->topLevelItem(2)->text(3), QStringLiteral("x.lss"));
+    QTreeWidgetItem* oddItem = list->topLevelItem(3);
+    QCOMPARE(frmVerifier::ResultOf(oddItem), odd);
+    QCOMPARE(oddItem->text(1), QStringLiteral("Severity 7"));
+    QCOMPARE(oddItem->text(2), QStringLiteral("98"));
+    QCOMPARE(oddItem->text(11), QStringLiteral("9"));
+    QVERIFY(oddItem->icon(0).isNull());
+    // The counters follow the results as they come.
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("1"));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("1"));
+    Q_UNUSED(info);
+    Q_UNUSED(error);
+}
+
+void FrmVerifierTest::ignoredResultsAreListedApartAndStillLogged() {
+    vtr::IgnoreLists::IgnoreMessageNumber(23);
+    const ResultPtr ignored =
+        LibVerify::AddResult(Severity::Error, "Sequence file does not exist", 23, 23, {"a.lms"});
+    QCOMPARE(Results()->topLevelItemCount(), 0);
+    QCOMPARE(Ignored()->topLevelItemCount(), 1);
+    QCOMPARE(frmVerifier::ResultOf(Ignored()->topLevelItem(0)), ignored);
+    QCOMPARE(LogLines().constLast(),
+             kStamp + QStringLiteral("Sequence file does not exist: a.lms"));
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("0"));
+}
+
+void FrmVerifierTest::ignoringMovesTheListedResults() {
+    const ResultPtr a = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr b = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    const ResultPtr c = LibVerify::AddResult(Severity::Error, "Six C", 6, 6, {"C"});
+    const ResultPtr d = LibVerify::AddResult(Severity::Warning, "Five D", 5, 5, {"D"});
+    QTreeWidget* results = Results();
+    QTreeWidget* ignored = Ignored();
+    auto* menu = Find<QMenu>("mnuResultPopup");
+
+    // Right click on B, "Ignore this result": B moves at once.
+    const QPoint onB = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, b)));
+    emit results->customContextMenuRequested(onB);
+    QVERIFY(menu->isVisible());
+    menu->actions()[2]->trigger();
+    menu->hide();
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Six C"),
+                                              QStringLiteral("Five D")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B")}));
+    QVERIFY(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"))
+                .find("\"IgnoreMsg1\"=\"5-B / \"") != std::string::npos);
+
+    // "Ignore all results with this message number" on A: the other fives follow, and the
+    // ignored list keeps the order in which the results were produced.
+    const QPoint onA = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, a)));
+    emit results->customContextMenuRequested(onA);
+    menu->actions()[3]->trigger();
+    menu->hide();
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Six C")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                                              QStringLiteral("Five D")}));
+    QVERIFY(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"))
+                .find("\"IgnoreMsgNum1\"=\"5\"") != std::string::npos);
+
+    // Taken off the message-number list, A and D come back in place; B stays ignored on its own.
+    vtr::IgnoreLists::UnignoreMessageNumber(5);
+    window_->RefreshIgnoredResults();
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Six C"),
+                                              QStringLiteral("Five D")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B")}));
+
+    // The keyboard: Delete ignores the selected result.
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    results->setFocus();
+    results->setCurrentItem(ItemOf(results, c));
+    QTest::keyClick(results, Qt::Key_Delete);
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five D")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B"), QStringLiteral("Six C")}));
+    QVERIFY(dialogs_->boxes.isEmpty());
+}
+
+void FrmVerifierTest::resultListsSortByValue() {
+    LibVerify::AddResult(Severity::Error, "ten first", 10, 10);
+    LibVerify::AddResult(Severity::Info, "two", 2, 2);
+    LibVerify::AddResult(Severity::Warning, "ten second", 10, 10);
+    LibVerify::AddResult(Severity::Warning, "seven", 7, 7);
+    QTreeWidget* list = Results();
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    // Until a header is clicked, the order produced.
+    QCOMPARE(ListTexts(list), (QStringList{QStringLiteral("ten first"), QStringLiteral("two"),
+                                           QStringLiteral("ten second"), QStringLiteral("seven")}));
+    // Message numbers by value (2 before 10), equal ones in the order produced.
+    const int msgNumX = list->header()->sectionViewportPosition(frmVerifier::MsgNumColumn) + 5;
+    QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
+    QCOMPARE(list->sortColumn(), int(frmVerifier::MsgNumColumn));
+    QCOMPARE(ListTexts(list),
+             (QStringList{QStringLiteral("two"), QStringLiteral("seven"),
+                          QStringLiteral("ten first"), QStringLiteral("ten second")}));
+    // Severities by weight, not by name.
+    list->sortByColumn(frmVerifier::SeverityColumn, Qt::AscendingOrder);
+    QCOMPARE(ListTexts(list), (QStringList{QStringLiteral("two"), QStringLiteral("ten second"),
+                                           QStringLiteral("seven"), QStringLiteral("ten first")}));
+    // A result added to a sorted list takes its place there.
+    LibVerify::AddResult(Severity::Info, "one", 1, 1);
+    QTRY_COMPARE(ListTexts(list).indexOf(QStringLiteral("one")), 1);
+}
+
+void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
+    LibVerify::AddResult(Severity::Warning, "Five", 5, 5, {"A"});
+    LibVerify::AddResult(Severity::Error, "Six", 6, 6, {"B", "C"});
+    const std::string report = folder_->File("report.txt");
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(report); };
+    Click("cmdSave");
+
+    QCOMPARE(dialogs_->requests.size(), 1);
+    const FileDialogRequest& request = dialogs_->requests.constFirst();
+    QCOMPARE(request.kind, FileDialogRequest::Kind::Save);
+    QCOMPARE(request.title, QStringLiteral("Save Verifier Results"));
+    QCOMPARE(request.initialFolder, QString::fromStdString(vtr::VTRCommon::GetUserDataPath()));
+    QCOMPARE(request.fileName, QStringLiteral("VTRVerifier Results"));
+    QCOMPARE(request.defaultExtension, QStringLiteral("txt"));
+    QCOMPARE(
+        request.filters,
+        (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}}}));
+    QCOMPARE(request.filterIndex, 1);
+    QVERIFY(request.promptToOverwrite && request.hideReadOnlyBox && request.pathMustExist &&
+            request.refuseReadOnlyFile);
+    QCOMPARE(vtr::testsupport::ReadFileBytes(report),
+             "Message Number: 5\r\nSeverity: Warning\r\nDescription: Five\r\nDetail: A\r\n" +
+                 std::string(79, '=') +
+                 "\r\nMessage Number: 6\r\nSeverity: Error\r\nDescription: Six\r\n"
+                 "Detail #1: B\r\nDetail #2: C\r\n");
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // Cancelling the dialog saves nothing.
+    fs::remove(report);
+    dialogs_->answer = nullptr;
+    Click("cmdSave");
+    QVERIFY(!fs::exists(report));
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // A file that cannot be written: the error under its title.
+    const std::string unwritable = folder_->File("no such folder") + "/report.txt";
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(unwritable); };
+    Click("cmdSave");
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
+    QVERIFY(dialogs_->boxes[0].text.startsWith(
+        QString::fromStdString("Cannot create the results file " + unwritable)));
+}
+
+void FrmVerifierTest::targetDialogsAndTheirFailures() {
+    const QList<FileFilter> sequenceFilters{
+        {QStringLiteral("Vantori Sequence Files"),
+         {QStringLiteral("*.las"), QStringLiteral("*.lms")}},
+        {QStringLiteral("- Animation Sequences"), {QStringLiteral("*.las")}},
+        {QStringLiteral("- Musical Sequences"), {QStringLiteral("*.lms")}}};
+    const QString chosen = QString::fromStdString(folder_->File("Carol.lms"));
+    dialogs_->answer = [&](const FileDialogRequest&) { return chosen; };
+    Click("cmdTargetSequence");
+    QCOMPARE(dialogs_->requests.size(), 1);
+    FileDialogRequest request = dialogs_->requests.takeFirst();
+    QCOMPARE(request.kind, FileDialogRequest::Kind::Open);
+    QCOMPARE(request.title, QStringLiteral("Choose Target Sequence"));
+    QVERIFY(request.fileName.isEmpty());
+    QCOMPARE(request.filters, sequenceFilters);
+    QCOMPARE(request.filterIndex, 1);
+    QVERIFY(request.fileMustExist && request.pathMustExist && request.hideReadOnlyBox &&
+            request.refuseReadOnlyFile && !request.promptToOverwrite);
+    // With no file yet, the dialog starts in the user-data folder.
+    QCOMPARE(request.initialFolder, QString::fromStdString(vtr::VTRCommon::GetUserDataPath()));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), chosen);
+    QVERIFY(Find<QRadioButton>("optTargetSequence")->isChecked());
+
+    // Cancelling leaves the box as it was.
+    dialogs_->answer = nullptr;
+    Click("cmdTargetSequence");
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), chosen);
+    // The next dialog starts where the chosen file is.
+    QCOMPARE(dialogs_->requests.takeFirst().initialFolder, QString::fromStdString(folder_->Path()));
+
+    Click("cmdTargetShow");
+    request = dialogs_->requests.takeFirst();
+    QCOMPARE(request.title, QStringLiteral("Choose Target Show"));
+    QCOMPARE(
+        request.filters,
+        (QList<FileFilter>{{QStringLiteral("Vantori Show Files"), {QStringLiteral("*.lss")}}}));
+    QVERIFY(Find<QLineEdit>("txtTargetShow")->text().isEmpty());
+    QVERIFY(Find<QRadioButton>("optTargetSequence")->isChecked());
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // A dialog that fails: its error under the title of the dialog's kind.
+    dialogs_->answer = [](const FileDialogRequest&) -> std::optional<QString> {
+        vtr::Raise(37, "test", "The dialog failed");
+    };
+    Click("cmdTargetShow");
+    Click("cmdTargetSequence");
+    QCOMPARE(
+        dialogs_->boxes,
+        (QList<RecordingPresenter::Box>{
+            {QStringLiteral("Error Selecting Show"), QStringLiteral("The dialog failed")},
+            {QStringLiteral("Error Selecting Sequence"), QStringLiteral("The dialog failed")}}));
+}
+
+void FrmVerifierTest::filtersInTheDialogsNotation() {
+    QCOMPARE(vtr::FilterText({QStringLiteral("Vantori Sequence Files"),
+                              {QStringLiteral("*.las"), QStringLiteral("*.lms")}}),
+             QStringLiteral("Vantori Sequence Files (*.las *.lms)"));
+    QCOMPARE(vtr::FilterText({QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}}),
+             QStringLiteral("Text Files (*.txt)"));
+    QCOMPARE(
+        vtr::ParseFilterList(QStringLiteral("Text Files (*.txt)|*.txt")),
+        (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}}}));
+    QCOMPARE(vtr::ParseFilterList(QStringLiteral("Sequences|*.las; *.lms|Shows|*.lss|dangling")),
+             (QList<FileFilter>{
+                 {QStringLiteral("Sequences"), {QStringLiteral("*.las"), QStringLiteral("*.lms")}},
+                 {QStringLiteral("Shows"), {QStringLiteral("*.lss")}}}));
+}
+
+void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
+#ifdef _WIN32
+    QSKIP("help goes to the system's help viewer on Windows");
+#else
+    vtr::testsupport::ChmContent help;
+    help.files = {{"/Verifier.htm", "<h1>The Verifier</h1>"},
+                  {"/msg43.htm", "<h1>Channel conflict</h1>"}};
+    help.contextMap = {{43, "msg43.htm"}};
+    const std::string helpFile = AppFolder() + "/VTRHelp.chm";
+    vtr::testsupport::WriteChm(helpFile, help);
+    auto viewerPage = [this] {
+        auto* viewer = window_->findChild<vtr::HelpViewer*>(QStringLiteral("HelpViewer"));
+        return viewer != nullptr && viewer->isVisible() ? viewer->CurrentPage() : QString();
+    };
+
+    // On the log tab: the verifier's own page.
+    Click("cmdHelp");
+    QCOMPARE(viewerPage(), QStringLiteral("/Verifier.htm"));
+
+    const ResultPtr conflict = LibVerify::AddResult(Severity::Warning, "Channel conflict", 43, 43);
+    const ResultPtr other =
+        LibVerify::AddResult(Severity::Warning, "Trigger uses undefined network", 56, 53);
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    Results()->setCurrentItem(ItemOf(Results(), conflict));
+    Click("cmdHelp");
+    QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
+    // The ignored tab with nothing selected: the verifier's page again.
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    Click("cmdHelp");
+    QCOMPARE(viewerPage(), QStringLiteral("/Verifier.htm"));
+
+    // "Help on this result" and a double-click open the result's topic; an id the help file
+    // does not map opens the verifier's page.
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    emit Results()->customContextMenuRequested(
+        Results()->viewport()->mapTo(Results(), OnItem(Results(), ItemOf(Results(), conflict))));
+    menu->actions()[0]->trigger();
+    menu->hide();
+    QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
+    window_->OpenResult(other);
+    QCOMPARE(viewerPage(), QStringLiteral("/Verifier.htm"));
+    QTreeWidgetItem* item = ItemOf(Results(), conflict);
+    DoubleClick(Results(), item);
+    QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // Without the help file, each way reports under its own title.
+    fs::remove(helpFile);
+    const QString failure = QString::fromStdString("Cannot open the help file " + helpFile);
+    Click("cmdHelp");
+    window_->HelpOnResult(conflict);
+    DoubleClick(Results(), item);
+    QCOMPARE(dialogs_->boxes, (QList<RecordingPresenter::Box>{
+                                  {QStringLiteral("Help File Error"), failure},
+                                  {QStringLiteral("Help Context Error"), failure},
+                                  {QStringLiteral("Details List Double Click Error"), failure}}));
+#endif
+}
+
+void FrmVerifierTest::placementAndTargetAreRemembered() {
+    window_->resize(777, 555);
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("/shows/Main.lss"));
+    Find<QLineEdit>("txtTargetSequence")->setText(QStringLiteral("/seq/Carol.lms"));
+    QVERIFY(window_->close());
+
+    window_ = MakeWindow();
+    QCOMPARE(window_->size(), QSize(777, 555));
+    QVERIFY(Find<QRadioButton>("optTargetShow")->isChecked());
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), QStringLiteral("/shows/Main.lss"));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), QStringLiteral("/seq/Carol.lms"));
+    // Kept in the window's own file, never in the suite's settings store.
+    QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg")), storeText_);
+}
+
+void FrmVerifierTest::aDroppedFileBecomesTheTarget() {
+    auto drop = [this](const QList<QUrl>& urls) {
+        QMimeData data;
+        data.setUrls(urls);
+        QDragEnterEvent enter(QPoint(10, 10), Qt::CopyAction, &data, Qt::LeftButton,
+                              Qt::NoModifier);
+        QApplication::sendEvent(window_.get(), &enter);
+        if (!enter.isAccepted())
+            return false;
+        QDropEvent dropped(QPointF(10, 10), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QApplication::sendEvent(window_.get(), &dropped);
+        return dropped.isAccepted();
+    };
+    const QString show = QString::fromStdString(folder_->File("Main.LSS"));
+    QVERIFY(drop({QUrl::fromLocalFile(show)}));
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), show);
+    QVERIFY(Find<QRadioButton>("optTargetShow")->isChecked());
+    const QString sequence = QString::fromStdString(folder_->File("Intro.las"));
+    QVERIFY(drop({QUrl::fromLocalFile(sequence)}));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), sequence);
+    QVERIFY(Find<QRadioButton>("optTargetSequence")->isChecked());
+
+    // Not a target: another kind of file, two files, a remote address.
+    QVERIFY(!drop({QUrl::fromLocalFile(QString::fromStdString(folder_->File("notes.txt")))}));
+    QVERIFY(!drop({QUrl::fromLocalFile(show), QUrl::fromLocalFile(sequence)}));
+    QVERIFY(!drop({QUrl(QStringLiteral("https://example.invalid/Main.lss"))}));
+    QVERIFY(!window_->SetTargetFile(QStringLiteral("weeksched.lsc")));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), sequence);
+    QVERIFY(Find<QRadioButton>("optTargetSequence")->isChecked());
+}
+
+void FrmVerifierTest::keyboardReachesTheCommands() {
+    // The buttons' own letters, and the usual keys.
+    // (A button's letter presses it visibly: the click follows a moment later.)
+    QTest::keyClick(window_.get(), Qt::Key_S, Qt::AltModifier);
+    QTRY_COMPARE(dialogs_->requests.size(), 1);
+    QTest::keyClick(window_.get(), Qt::Key_S, Qt::ControlModifier);
+    QCOMPARE(dialogs_->requests.size(), 2);
+    QCOMPARE(dialogs_->requests[1].title, QStringLiteral("Save Verifier Results"));
+    Find<QRadioButton>("optTargetSequence")->setChecked(true);
+    QTest::keyClick(window_.get(), Qt::Key_O, Qt::ControlModifier);
+    QCOMPARE(dialogs_->requests.size(), 3);
+    QCOMPARE(dialogs_->requests[2].title, QStringLiteral("Choose Target Sequence"));
+    // Alt+V verifies; the empty sequence box says so.
+    QTest::keyClick(window_.get(), Qt::Key_V, Qt::AltModifier);
+    QTRY_COMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].text, QStringLiteral("Please specify the sequence file to verify"));
+    // F1: help (here without a help file, so its error).
+    QTest::keyClick(window_.get(), Qt::Key_F1);
+    QCOMPARE(dialogs_->boxes.size(), 2);
+    QCOMPARE(dialogs_->boxes[1].title, QStringLiteral("Help File Error"));
+    // The menu key opens the pop-up menu on the current result.
+    LibVerify::AddResult(Severity::Warning, "Five", 5, 5);
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    Results()->setFocus();
+    Results()->setCurrentItem(Results()->topLevelItem(0));
+    QContextMenuEvent menuKey(QContextMenuEvent::Keyboard, QPoint(0, 0),
+                              Results()->mapToGlobal(QPoint(0, 0)));
+    QApplication::sendEvent(Results(), &menuKey);
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    QTRY_VERIFY(menu->isVisible());
+    menu->hide();
+}
+
+VTR_UI_TEST_MAIN(FrmVerifierTest)
+#include "tst_frmVerifier.moc"
