@@ -1,9 +1,11 @@
 #include "environment/MediaPlayerProbe.h"
 
 #include <charconv>
+#include <utility>
 #include <vector>
 
 #include "engine/VtrError.h"
+#include "environment/LibRegistryVTRShared.h"
 
 #ifdef _WIN32
 #include <windows.h>
@@ -11,8 +13,6 @@
 #include <objbase.h>
 #include <oleauto.h>
 #include <wmp.h>
-#else
-#include "environment/LibRegistryVTRShared.h"
 #endif
 
 namespace vtr::MediaPlayerProbe {
@@ -22,6 +22,11 @@ constexpr const char* kSource = "MediaPlayerProbe.VersionText";
 #ifdef _WIN32
 constexpr const char* kControlProgId = "WMPlayer.OCX";
 #endif
+
+VersionSource& InstalledSource() {
+    static VersionSource source;
+    return source;
+}
 
 std::vector<std::string> Split(const std::string& text, char separator) {
     std::vector<std::string> parts;
@@ -140,11 +145,22 @@ std::string ControlVersionText(const std::string& progId) {
 }
 #endif
 
+std::string StoredVersionText() {
+    return LibRegistryVTRShared::GetSharedString("VersionInfo", "MediaPlayer", "");
+}
+
+VersionSource SetVersionSource(VersionSource source) {
+    std::swap(source, InstalledSource());
+    return source;
+}
+
 std::string VersionText() {
+    if (const VersionSource& source = InstalledSource())
+        return source();
 #ifdef _WIN32
     return ControlVersionText(kControlProgId);
 #else
-    return LibRegistryVTRShared::GetSharedString("VersionInfo", "MediaPlayer", "");
+    return StoredVersionText();
 #endif
 }
 

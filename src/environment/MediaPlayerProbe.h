@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 
 // The version of the media player that the suite plays audio through. On Windows it is the
@@ -12,6 +13,29 @@ namespace vtr::MediaPlayerProbe {
 // The player's version text ("12.0.19041.1"); "" when the setting is absent or no control
 // is installed. Raises when an installed control cannot be created or asked.
 std::string VersionText();
+
+// The version text as the store records it: "VersionInfo" of "Shared\MediaPlayer", "" when
+// absent. VersionText's answer away from Windows.
+std::string StoredVersionText();
+
+// Installs where VersionText's answer comes from; an empty function restores the platform's
+// own (the control on Windows, the store elsewhere). Returns the source installed before.
+// Tests use it so as not to depend on the machine's media player.
+using VersionSource = std::function<std::string()>;
+VersionSource SetVersionSource(VersionSource source);
+
+// Restores the previous source when it goes out of scope.
+class ScopedVersionSource {
+  public:
+    explicit ScopedVersionSource(VersionSource source)
+        : previous_(SetVersionSource(std::move(source))) {}
+    ~ScopedVersionSource() { SetVersionSource(std::move(previous_)); }
+    ScopedVersionSource(const ScopedVersionSource&) = delete;
+    ScopedVersionSource& operator=(const ScopedVersionSource&) = delete;
+
+  private:
+    VersionSource previous_;
+};
 
 #ifdef _WIN32
 // The versionInfo property of the media player control registered under progId, read

@@ -102,7 +102,8 @@ StoreTest::StoreTest()
       tmpdir_("TMPDIR", folder_.File("tmp"))
 #ifdef _WIN32
       ,
-      tmp_("TMP", folder_.File("tmp"))
+      tmp_("TMP", folder_.File("tmp")),
+      mediaPlayer_(MediaPlayerProbe::StoredVersionText)
 #endif
 {
     fs::create_directories(TempDir());
