@@ -21,10 +21,10 @@ jobs=${VTR_JOBS:-2}
 start=$(date +%s)
 step() { echo; echo "=== windows: $1 ($(($(date +%s) - start))s)"; }
 
-# Wine's server outlives the programs by a few seconds; the job leaves none behind.
+# Wine's server outlives the programs for a while; the job leaves none behind.
 stop_wine() {
     if [ -f "$prefix/system.reg" ]; then
-        WINEPREFIX=$prefix timeout 30 wineserver -k 2>/dev/null || true
+        "${wine_run[@]}" --stop
     fi
 }
 trap stop_wine EXIT
