@@ -151,6 +151,13 @@ std::string Replacement(const std::string& placeholder, FileKind kind,
     Fail("unknown placeholder @" + placeholder + "@");
 }
 
+#ifdef _WIN32
+// The characters of the file and folder names that follow the folder in the sources.
+bool IsPathNameCharacter(char c) {
+    return std::isalnum(static_cast<unsigned char>(c)) != 0 || c == '.' || c == '_' || c == '-';
+}
+#endif
+
 bool IsPlaceholderStart(const std::string& text, std::size_t at) {
     for (const char* name : {"DEMO@", "DATE+", "WEEKTIME+"}) {
         if (text.compare(at, std::char_traits<char>::length(name), name) == 0)
@@ -255,8 +262,22 @@ std::string Substitute(const std::string& text, FileKind kind, const std::string
         const std::size_t end = text.find('@', at + 1);
         if (end == std::string::npos)
             Fail("unterminated placeholder at \"" + text.substr(at, 20) + "\"");
-        result += Replacement(text.substr(at + 1, end - at - 1), kind, demoFolder, today);
+        const std::string placeholder = text.substr(at + 1, end - at - 1);
+        result += Replacement(placeholder, kind, demoFolder, today);
         position = end + 1;
+#ifdef _WIN32
+        // The path after the folder ("/data/shows/Evening.lss") takes the system's separator,
+        // so that the instance names its files as Windows programs do.
+        if (placeholder == "DEMO") {
+            while (position + 1 < text.size() && text[position] == '/' &&
+                   IsPathNameCharacter(text[position + 1])) {
+                result += EscapeFor(kind, "\\");
+                ++position;
+                while (position < text.size() && IsPathNameCharacter(text[position]))
+                    result += text[position++];
+            }
+        }
+#endif
     }
 }
 

@@ -8,7 +8,8 @@
 // Turns the demo installation's sources (examples/demo) into a working installation in a
 // folder of its own. The sources hold placeholders where an installation needs absolute
 // paths or dates:
-//   @DEMO@              the folder of the instance (absolute, no trailing separator);
+//   @DEMO@              the folder of the instance (absolute, no trailing separator; on
+//                       Windows the "/"-separated path after it takes "\" instead);
 //   @DATE+N@            the date N days after the day of instantiation, "yyyy-mm-dd";
 //   @WEEKTIME+N H:MM@   that date's weekday at H:MM, as a week time (seconds since Sunday
 //                       00:00:00), for the calendar schedule's events.

@@ -1,20 +1,33 @@
 #include "environment/MediaPlayerProbe.h"
 
 #include <charconv>
+#include <utility>
 #include <vector>
 
 #include "engine/VtrError.h"
+#include "environment/LibRegistryVTRShared.h"
 
 #ifdef _WIN32
+#include <windows.h>
+// windows.h first: the COM headers need its definitions.
 #include <objbase.h>
 #include <oleauto.h>
-#include <windows.h>
-#else
-#include "environment/LibRegistryVTRShared.h"
+#include <wmp.h>
 #endif
 
 namespace vtr::MediaPlayerProbe {
 namespace {
+
+#ifdef _WIN32
+// COM failures are reported under this source; only Windows asks the player itself.
+constexpr const char* kSource = "MediaPlayerProbe.VersionText";
+constexpr const char* kControlProgId = "WMPlayer.OCX";
+#endif
+
+VersionSource& InstalledSource() {
+    static VersionSource source;
+    return source;
+}
 
 std::vector<std::string> Split(const std::string& text, char separator) {
     std::vector<std::string> parts;
@@ -65,69 +78,90 @@ class ComApartment {
     HRESULT result_;
 };
 
-constexpr const char* kSource = "MediaPlayerProbe.VersionText";
-
 [[noreturn]] void RaiseComFailure(const char* step, HRESULT result) {
     char code[16];
     wsprintfA(code, "%08lX", static_cast<unsigned long>(result));
     Raise(ErrorNumbers::ObjectNotSet, kSource, std::string(step) + " failed (0x" + code + ")");
 }
 
-// The control's versionInfo property, asked for by name through its dispatch interface.
-std::string ReadControlVersion() {
-    ComApartment apartment;
-    CLSID classId;
-    HRESULT result = CLSIDFromProgID(L"WMPlayer.OCX", &classId);
-    if (FAILED(result))
-        RaiseComFailure("Finding the media player control", result);
-    ComRef<IDispatch> player;
-    result = CoCreateInstance(classId, nullptr, CLSCTX_INPROC_SERVER, IID_IDispatch,
-                              reinterpret_cast<void**>(player.Receive()));
-    if (FAILED(result))
-        RaiseComFailure("Creating the media player control", result);
+// The failures that mean the control is not installed at all, as opposed to one that is
+// there but cannot be created or asked.
+bool IsMissingControl(HRESULT result) {
+    return result == CO_E_CLASSSTRING || result == REGDB_E_CLASSNOTREG ||
+           result == HRESULT_FROM_WIN32(ERROR_MOD_NOT_FOUND) ||
+           result == HRESULT_FROM_WIN32(ERROR_FILE_NOT_FOUND);
+}
 
-    OLECHAR name[] = L"versionInfo";
-    LPOLESTR names[] = {name};
-    DISPID dispatchId = 0;
-    result = player->GetIDsOfNames(IID_NULL, names, 1, LOCALE_USER_DEFAULT, &dispatchId);
-    if (FAILED(result))
-        RaiseComFailure("Finding versionInfo", result);
-    DISPPARAMS noArguments{nullptr, nullptr, 0, 0};
-    VARIANT value;
-    VariantInit(&value);
-    result = player->Invoke(dispatchId, IID_NULL, LOCALE_USER_DEFAULT, DISPATCH_PROPERTYGET,
-                            &noArguments, &value, nullptr, nullptr);
-    if (FAILED(result))
-        RaiseComFailure("Reading versionInfo", result);
-    result = VariantChangeType(&value, &value, 0, VT_BSTR);
-    if (FAILED(result)) {
-        VariantClear(&value);
-        RaiseComFailure("Reading versionInfo as text", result);
-    }
-    std::string text;
-    const int length = SysStringLen(value.bstrVal);
-    if (length > 0) {
-        const int bytes =
-            WideCharToMultiByte(CP_ACP, 0, value.bstrVal, length, nullptr, 0, nullptr, nullptr);
-        text.resize(bytes > 0 ? bytes : 0);
-        if (bytes > 0) {
-            WideCharToMultiByte(CP_ACP, 0, value.bstrVal, length, text.data(), bytes, nullptr,
-                                nullptr);
-        }
-    }
-    VariantClear(&value);
-    return text;
+std::string ToAnsi(BSTR text) {
+    std::string result;
+    const int length = text != nullptr ? static_cast<int>(SysStringLen(text)) : 0;
+    if (length == 0)
+        return result;
+    const int bytes = WideCharToMultiByte(CP_ACP, 0, text, length, nullptr, 0, nullptr, nullptr);
+    if (bytes <= 0)
+        return result;
+    result.resize(bytes);
+    WideCharToMultiByte(CP_ACP, 0, text, length, result.data(), bytes, nullptr, nullptr);
+    return result;
 }
 
 #endif
 
 }  // namespace
 
-std::string VersionText() {
 #ifdef _WIN32
-    return ReadControlVersion();
-#else
+std::string ControlVersionText(const std::string& progId) {
+    ComApartment apartment;
+    const int chars = MultiByteToWideChar(CP_ACP, 0, progId.c_str(), -1, nullptr, 0);
+    std::wstring wideProgId(chars > 0 ? chars : 1, L'\0');
+    if (chars > 0)
+        MultiByteToWideChar(CP_ACP, 0, progId.c_str(), -1, wideProgId.data(), chars);
+
+    CLSID classId;
+    HRESULT result = CLSIDFromProgID(wideProgId.c_str(), &classId);
+    if (IsMissingControl(result))
+        return "";
+    if (FAILED(result))
+        RaiseComFailure("Finding the media player control", result);
+    ComRef<IUnknown> control;
+    result = CoCreateInstance(classId, nullptr, CLSCTX_INPROC_SERVER, IID_IUnknown,
+                              reinterpret_cast<void**>(control.Receive()));
+    if (IsMissingControl(result))
+        return "";
+    if (FAILED(result))
+        RaiseComFailure("Creating the media player control", result);
+    // The property belongs to the control's core interface, which every version of the
+    // control has; asking it there needs no type information, unlike asking by name.
+    ComRef<IWMPCore> core;
+    result = control->QueryInterface(__uuidof(IWMPCore), reinterpret_cast<void**>(core.Receive()));
+    if (FAILED(result))
+        RaiseComFailure("Asking the control for its core interface", result);
+    BSTR version = nullptr;
+    result = core->get_versionInfo(&version);
+    if (FAILED(result))
+        RaiseComFailure("Reading versionInfo", result);
+    const std::string text = ToAnsi(version);
+    SysFreeString(version);
+    return text;
+}
+#endif
+
+std::string StoredVersionText() {
     return LibRegistryVTRShared::GetSharedString("VersionInfo", "MediaPlayer", "");
+}
+
+VersionSource SetVersionSource(VersionSource source) {
+    std::swap(source, InstalledSource());
+    return source;
+}
+
+std::string VersionText() {
+    if (const VersionSource& source = InstalledSource())
+        return source();
+#ifdef _WIN32
+    return ControlVersionText(kControlProgId);
+#else
+    return StoredVersionText();
 #endif
 }
 

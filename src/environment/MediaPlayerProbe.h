@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 
 // The version of the media player that the suite plays audio through. On Windows it is the
@@ -9,9 +10,40 @@
 // the string "VersionInfo" of "Software\Vantori\Shared\MediaPlayer".
 namespace vtr::MediaPlayerProbe {
 
-// The player's version text ("12.0.19041.1"); "" when the setting is absent. Raises when
-// the control cannot be created or asked.
+// The player's version text ("12.0.19041.1"); "" when the setting is absent or no control
+// is installed. Raises when an installed control cannot be created or asked.
 std::string VersionText();
+
+// The version text as the store records it: "VersionInfo" of "Shared\MediaPlayer", "" when
+// absent. VersionText's answer away from Windows.
+std::string StoredVersionText();
+
+// Installs where VersionText's answer comes from; an empty function restores the platform's
+// own (the control on Windows, the store elsewhere). Returns the source installed before.
+// Tests use it so as not to depend on the machine's media player.
+using VersionSource = std::function<std::string()>;
+VersionSource SetVersionSource(VersionSource source);
+
+// Restores the previous source when it goes out of scope.
+class ScopedVersionSource {
+  public:
+    explicit ScopedVersionSource(VersionSource source)
+        : previous_(SetVersionSource(std::move(source))) {}
+    ~ScopedVersionSource() { SetVersionSource(std::move(previous_)); }
+    ScopedVersionSource(const ScopedVersionSource&) = delete;
+    ScopedVersionSource& operator=(const ScopedVersionSource&) = delete;
+
+  private:
+    VersionSource previous_;
+};
+
+#ifdef _WIN32
+// The versionInfo property of the media player control registered under progId, read
+// through COM from the control's core interface: "" when no such control is installed;
+// raises when it cannot be created or has no such interface. VersionText asks the
+// operating system's control, "WMPlayer.OCX".
+std::string ControlVersionText(const std::string& progId);
+#endif
 
 // True when the version text has exactly four "."-separated parts and the first is a whole
 // number written canonically (no sign, blank or leading zero that converting it to a

@@ -65,21 +65,23 @@ std::string WriteTarget(const std::string& path) {
 
 namespace {
 
-int64_t FileTimeValue(const FILETIME& time) {
-    return static_cast<int64_t>(static_cast<uint64_t>(time.dwHighDateTime) << 32 |
-                                time.dwLowDateTime);
+int64_t TimeValue(const LARGE_INTEGER& time) {
+    return static_cast<int64_t>(time.QuadPart);
 }
 
+// Size, last write and last change of the open file. The file's identity (volume and index)
+// is left out on purpose: asking for the volume costs a round trip to the volume manager on
+// every look, and a file replaced by a writer has a new write and change time anyway.
 Stamp StampOfHandle(HANDLE file) {
     Stamp stamp;
-    BY_HANDLE_FILE_INFORMATION info;
-    if (GetFileInformationByHandle(file, &info)) {
+    FILE_BASIC_INFO basic;
+    FILE_STANDARD_INFO standard;
+    if (GetFileInformationByHandleEx(file, FileBasicInfo, &basic, sizeof basic) &&
+        GetFileInformationByHandleEx(file, FileStandardInfo, &standard, sizeof standard)) {
         stamp.exists = true;
-        stamp.device = info.dwVolumeSerialNumber;
-        stamp.inode = static_cast<uint64_t>(info.nFileIndexHigh) << 32 | info.nFileIndexLow;
-        stamp.size = static_cast<uint64_t>(info.nFileSizeHigh) << 32 | info.nFileSizeLow;
-        stamp.modified = FileTimeValue(info.ftLastWriteTime);
-        stamp.changed = FileTimeValue(info.ftCreationTime);
+        stamp.size = static_cast<uint64_t>(standard.EndOfFile.QuadPart);
+        stamp.modified = TimeValue(basic.LastWriteTime);
+        stamp.changed = TimeValue(basic.ChangeTime);
     }
     return stamp;
 }

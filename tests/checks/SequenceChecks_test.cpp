@@ -115,8 +115,8 @@ TEST_F(SequenceChecksTest, ALoadedSequenceQueuesItsChecksInOrder) {
     CheckSequenceLoads check(path);
     EXPECT_THAT(
         RunCheck(check),
-        ElementsAre("Media file existence: " + DataFolder() +
-                        "media/Carol.mp3 (referenced in sequence " + path + ")",
+        ElementsAre("Media file existence: " + MediaFile("Carol.mp3") +
+                        " (referenced in sequence " + path + ")",
                     "Sequence has events: " + path, "Sequence file channel conflicts: " + path,
                     "Channels have events: " + path, "Channel physical settings: " + path,
                     "Channels use defined networks: " + path, "Channel length conflicts: " + path,
@@ -139,7 +139,7 @@ TEST_F(SequenceChecksTest, ASequenceWithoutMediaOrShellCommandQueuesOnlyItsConte
 
 TEST_F(SequenceChecksTest, MediaNamesResolveAgainstTheMediaFolderOrTheSequencesOwn) {
     const MediaPathResolver resolver;
-    EXPECT_EQ(resolver.Resolve("Carol.mp3", "/shows/Carol.lms"), DataFolder() + "media/Carol.mp3");
+    EXPECT_EQ(resolver.Resolve("Carol.mp3", "/shows/Carol.lms"), MediaFile("Carol.mp3"));
     EXPECT_EQ(resolver.Resolve("/music/Carol.mp3", "/shows/Carol.lms"), "/music/Carol.mp3");
     EXPECT_EQ(resolver.Resolve("C:\\Music\\Carol.mp3", "/shows/Carol.lms"), "C:\\Music\\Carol.mp3");
     store["Shared"].erase("MediaDataPath");
@@ -149,8 +149,8 @@ TEST_F(SequenceChecksTest, MediaNamesResolveAgainstTheMediaFolderOrTheSequencesO
 }
 
 TEST_F(SequenceChecksTest, AnExistingMediaFileGivesNothing) {
-    WriteFileBytes(DataFolder() + "media/Carol.mp3", "ID3");
-    CheckMediaFileExists check(DataFolder() + "media/Carol.mp3", "Carol.lms");
+    WriteFileBytes(MediaFile("Carol.mp3"), "ID3");
+    CheckMediaFileExists check(MediaFile("Carol.mp3"), "Carol.lms");
     RunCheck(check);
     EXPECT_THAT(ResultTexts(), IsEmpty());
 }

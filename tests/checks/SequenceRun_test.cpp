@@ -117,7 +117,7 @@ TEST_F(SequenceRunTest, EverythingAShowReachesIsVerifiedAndBadInputDoesNotStopTh
         UnorderedElementsAreArray({
             "23: [SEQUENCE]: " + missing + inShow,
             "24: " + broken,
-            "26: [FILE]: " + DataFolder() + "media/Song.mp3 | [SEQUENCE]: " + song,
+            "26: [FILE]: " + MediaFile("Song.mp3") + " | [SEQUENCE]: " + song,
             "30: [SEQUENCE]: " + a + " | [TRACK]: Track 1: Main | [CHANNEL]: Sub B",
             "31: [SEQUENCE]: " + a + " | [TRACK]: Track 1: Main | [CHANNEL]: Far",
             "30: [SEQUENCE]: " + b + " | [TRACK]: Track 1: Loop | [CHANNEL]: Back to A",
@@ -143,8 +143,8 @@ TEST_F(SequenceRunTest, EverythingAShowReachesIsVerifiedAndBadInputDoesNotStopTh
         Count("Checking Sequence file existence: " + b + " (referenced in sequence " + b + ")"), 1);
     EXPECT_EQ(Count("Checking Trigger on VTR Enhanced network: Startup trigger"), 1);
     EXPECT_EQ(Count("Checking Intersequence channel conflicts: " + showFile), 1);
-    EXPECT_EQ(Count("Checking Media file existence: " + DataFolder() +
-                    "media/Song.mp3 (referenced in sequence " + song + ")"),
+    EXPECT_EQ(Count("Checking Media file existence: " + MediaFile("Song.mp3") +
+                    " (referenced in sequence " + song + ")"),
               1);
     // Every sequence file is read once, the one that fails to load included.
     EXPECT_EQ(LibVerify::GetFileLoadCounts().sequenceLoads, 6);

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <map>
 #include <string>
@@ -15,6 +16,13 @@
 #include "support/TempStore.h"
 
 namespace vtr::cli::testing {
+
+// The separator the verifier puts between a folder and a name.
+#ifdef _WIN32
+inline constexpr char kSeparator = '\\';
+#else
+inline constexpr char kSeparator = '/';
+#endif
 
 // A test on its own instance of the demo installation, made in the test's folder with a fixed
 // day of instantiation, with the clock set to that day (19:30:00) for the whole test.
@@ -39,8 +47,27 @@ class DemoTest : public testsupport::StoreTest {
     }
 
     // A path inside the instance.
-    std::string Demo(const std::string& relative) const { return demoFolder_ + "/" + relative; }
-    std::string DemoStore() const { return Demo("registry.reg"); }
+    std::string Demo(const std::string& relative) const {
+#ifdef _WIN32
+        // The instance names its files with the system's separator on Windows.
+        std::string native = relative;
+        std::replace(native.begin(), native.end(), '/', '\\');
+        return demoFolder_ + kSeparator + native;
+#else
+        return demoFolder_ + "/" + relative;
+#endif
+    }
+    // A file of the application or media folder, as the verifier names it: the folder as the
+    // store has it, then the platform's separator.
+    std::string AppFile(const std::string& name) const {
+        return Demo("app") + kSeparator + name;
+    }
+    std::string MediaFile(const std::string& name) const {
+        return Demo("media") + kSeparator + name;
+    }
+    std::string DemoStore() const {
+        return Demo("registry.reg");
+    }
 
     // The command line with --registry naming the instance's store.
     Outcome Run(std::vector<std::string> arguments, bool terminal = false, int columns = 80,

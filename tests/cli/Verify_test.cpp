@@ -56,7 +56,7 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
     EXPECT_EQ(outcome.out,
               "Error 16: Application file has unexpected version number\n"
               "    [FILE]: " +
-                  Demo("app/SuiteTray.exe") +
+                  AppFile("SuiteTray.exe") +
                   "\n"
                   "    [EXPECTED]: 1.0.0.0\n"
                   "    [FOUND]: 0.9.4.2\n"
@@ -105,7 +105,7 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "    [CHANNEL]: Driveway\n"
                   "Error 26: Media file does not exist\n"
                   "    [FILE]: " +
-                  Demo("media/Jingle.mp3") +
+                  MediaFile("Jingle.mp3") +
                   "\n"
                   "    [SEQUENCE]: " +
                   sequences +
@@ -114,7 +114,7 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "Ignored results:\n"
                   "Warning 6: Verifier not running from VTR application path\n"
                   "    [APPLICATION]: " +
-                  Demo("app/") +
+                  AppFile("") +
                   "\n"
                   "    [VERIFIER]: " +
                   VTRCommon::GetProgramFolder() +
@@ -165,7 +165,7 @@ TEST_F(VerifyDemoTest, EachTargetFindsItsOwnShareOfTheDemo) {
     }
 
     // Without the wrong application file only the sequence's own warning is left.
-    testsupport::WritePeImage(Demo("app/SuiteTray.exe"), DefaultExpectedVersion());
+    testsupport::WritePeImage(AppFile("SuiteTray.exe"), DefaultExpectedVersion());
     Outcome outcome = Run({"--sequence", Demo("data/sequences/Snowfall.las")});
     EXPECT_EQ(outcome.status, 1);
     outcome = Run({"--sequence", Demo("data/sequences/Sparkle.las")});
@@ -293,6 +293,9 @@ TEST_F(VerifyDemoTest, ATargetThatCannotBeSetUpExitsThreeWithTheReason) {
     // No temporary folder to write the wrapping schedule into.
     {
         testsupport::ScopedEnvironment noTemp("TMPDIR", folder_.File("no such folder"));
+#ifdef _WIN32
+        testsupport::ScopedEnvironment noTmp("TMP", folder_.File("no such folder"));
+#endif
         const Outcome outcome = Run({"--show", Demo("data/shows/Evening.lss")});
         EXPECT_EQ(outcome.status, 3);
         EXPECT_EQ(outcome.out, "");
@@ -339,7 +342,7 @@ TEST_F(VerifyDemoTest, TheReportIsSavedAndTheLogWrittenAsTheWindowWritesIt) {
                            "Severity: Error\r\n"
                            "Description: Application file has unexpected version number\r\n"
                            "Detail #1: [FILE]: " +
-                           Demo("app/SuiteTray.exe") +
+                           AppFile("SuiteTray.exe") +
                            "\r\n"
                            "Detail #2: [EXPECTED]: 1.0.0.0\r\n"
                            "Detail #3: [FOUND]: 0.9.4.2\r\n"));
@@ -358,7 +361,7 @@ TEST_F(VerifyDemoTest, TheReportIsSavedAndTheLogWrittenAsTheWindowWritesIt) {
         EXPECT_THAT(line, StartsWith("7:30:00 PM: "));
     EXPECT_THAT(lines, ::testing::Contains("7:30:00 PM: Application file has unexpected version "
                                            "number: [FILE]: " +
-                                           Demo("app/SuiteTray.exe") +
+                                           AppFile("SuiteTray.exe") +
                                            " / [EXPECTED]: 1.0.0.0 / [FOUND]: 0.9.4.2"));
     // Ignored results are logged too.
     EXPECT_THAT(lines, ::testing::Contains(
@@ -452,7 +455,12 @@ TEST_F(VerifyDemoTest, OnATerminalAProgressLineIsDrawnAndErasedAndQuietHidesIt) 
 // The same demo in a folder whose name needs escaping in every format of the suite.
 class AwkwardFolderDemoTest : public DemoTest {
   protected:
+#ifdef _WIN32
+    // Windows allows no "*" in a name.
+    AwkwardFolderDemoTest() : DemoTest("demo (a,b) & 'c' [x]") {}
+#else
     AwkwardFolderDemoTest() : DemoTest("demo (a,b) & 'c' *x*") {}
+#endif
 };
 
 TEST_F(AwkwardFolderDemoTest, FindsWhatTheDemoFindsAnywhere) {

@@ -8,6 +8,7 @@
 
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
+#include "environment/LibFile.h"
 #include "environment/NetworkPreferences.h"
 #include "schedule/Schedule.h"
 #include "schedule/YearSchedule.h"
@@ -273,7 +274,7 @@ TEST_F(DriverTest, VerifyingASequenceMakesThreeTemporaryFilesThatTheRunDeletes) 
     EXPECT_EQ(made[2].rfind("VTRVer-YS-", 0), 0u);
 
     // The show holds the sequence as the only entry of its musical section.
-    const std::string showFile = TempDir() + "/" + made[0];
+    const std::string showFile = LibFile::AddTrailingBackslash(TempDir()) + made[0];
     ShowPtr show = ShowFunctions::LoadShowFile(showFile);
     ASSERT_TRUE(show);
     EXPECT_THAT(show->Musical()->List(), ElementsAre("/shows/Carol.lms"));
@@ -282,8 +283,10 @@ TEST_F(DriverTest, VerifyingASequenceMakesThreeTemporaryFilesThatTheRunDeletes) 
               0);
 
     // One show event, day 1 from 3:00:37 to 7:00:37; an empty calendar.
-    EXPECT_EQ(LibVerify::VerifiedWeeklyScheduleFile(), TempDir() + "/" + made[1]);
-    EXPECT_EQ(LibVerify::VerifiedYearlyScheduleFile(), TempDir() + "/" + made[2]);
+    EXPECT_EQ(LibVerify::VerifiedWeeklyScheduleFile(),
+              LibFile::AddTrailingBackslash(TempDir()) + made[1]);
+    EXPECT_EQ(LibVerify::VerifiedYearlyScheduleFile(),
+              LibFile::AddTrailingBackslash(TempDir()) + made[2]);
     SchedulePtr weekly = LibVerify::GetSchedule();
     ASSERT_TRUE(weekly);
     ShowEventPtr event = weekly->FirstShowEvent();

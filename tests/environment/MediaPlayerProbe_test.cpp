@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "engine/VtrError.h"
 #include "support/VerifierFixture.h"
 
 namespace vtr {
@@ -29,6 +30,28 @@ TEST(MediaPlayerProbe, TheMajorVersionMustBeCanonicalAndHigh) {
 TEST(MediaPlayerProbe, AMinimumOfZeroOrLessIsAlwaysMet) {
     EXPECT_TRUE(IsVersionTextAtLeast("", 0));
     EXPECT_TRUE(IsVersionTextAtLeast("garbage", -3));
+}
+
+TEST(MediaPlayerProbe, AnInstalledSourceAnswersUntilItGoesAndAFailingOneMeetsNoMinimum) {
+    using MediaPlayerProbe::IsVersionAtLeast;
+    using MediaPlayerProbe::ScopedVersionSource;
+    using MediaPlayerProbe::VersionText;
+    const std::string own = ResumeOr(std::string("raised"), [] { return VersionText(); });
+    {
+        ScopedVersionSource installed([] { return std::string("10.0.0.1"); });
+        EXPECT_EQ(VersionText(), "10.0.0.1");
+        EXPECT_TRUE(IsVersionAtLeast(10));
+        EXPECT_FALSE(IsVersionAtLeast(11));
+        {
+            ScopedVersionSource failing(
+                []() -> std::string { Raise(ErrorNumbers::ObjectNotSet, "test", "no control"); });
+            EXPECT_THROW(VersionText(), VtrError);
+            EXPECT_FALSE(IsVersionAtLeast(9));
+            EXPECT_FALSE(IsVersionAtLeast(0));  // a probe that fails meets no minimum at all
+        }
+        EXPECT_EQ(VersionText(), "10.0.0.1");
+    }
+    EXPECT_EQ(ResumeOr(std::string("raised"), [] { return VersionText(); }), own);
 }
 
 #ifndef _WIN32

@@ -119,7 +119,9 @@ TEST(VTRCommon, ProgramFolderIsTheFolderOfTheRunningExecutable) {
     ASSERT_FALSE(folder.empty());
     EXPECT_EQ(folder.back(), kSep);
     // The tests run from their build folder.
-    EXPECT_TRUE(fs::equivalent(folder, fs::path(VTR_BINARY_DIR) / "tests"));
+    // (Without its trailing separator: the system's file status refuses a folder named with
+    // one on Windows.)
+    EXPECT_TRUE(fs::equivalent(fs::path(folder).parent_path(), fs::path(VTR_BINARY_DIR) / "tests"));
 }
 
 TEST(LibSecurityTokens, PrivilegesAreGrantedWhereTheyDoNotExist) {

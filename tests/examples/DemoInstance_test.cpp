@@ -11,6 +11,7 @@
 #include "environment/FileVersion.h"
 #include "support/PeImage.h"
 #include "support/TempStore.h"
+#include "support/VerifierFixture.h"
 
 namespace vtr::demo {
 namespace {
@@ -33,14 +34,24 @@ std::string ErrorOf(const std::function<void()>& call) {
     return "(no error)";
 }
 
+// The separator after the folder, as the instance writes it (escaped in registry strings).
+#ifdef _WIN32
+const std::string kSep = "\\";
+const std::string kRegSep = "\\\\";
+#else
+const std::string kSep = "/";
+const std::string kRegSep = "/";
+#endif
+
 TEST(DemoSubstituteTest, TheFolderIsEscapedAsEachFormatNeeds) {
     const std::string folder = "/b (x,y)/a*b \"q\" & <z>\\w";
     EXPECT_EQ(Substitute("\"AppPath\"=\"@DEMO@/app\"", FileKind::Registry, folder, Today()),
-              "\"AppPath\"=\"/b (x,y)/a*b \\\"q\\\" & <z>\\\\w/app\"");
+              "\"AppPath\"=\"/b (x,y)/a*b \\\"q\\\" & <z>\\\\w" + kRegSep + "app\"");
     EXPECT_EQ(Substitute("(@DEMO@/s.las)", FileKind::ListNotation, folder, Today()),
-              "(/b *Ox*Sy*C/a*Eb \"q\" & <z>\\w/s.las)");
-    EXPECT_EQ(Substitute("<c subsequence=\"@DEMO@/s.las\"/>", FileKind::Xml, folder, Today()),
-              "<c subsequence=\"/b (x,y)/a*b &quot;q&quot; &amp; &lt;z&gt;\\w/s.las\"/>");
+              "(/b *Ox*Sy*C/a*Eb \"q\" & <z>\\w" + kSep + "s.las)");
+    EXPECT_EQ(
+        Substitute("<c subsequence=\"@DEMO@/s.las\"/>", FileKind::Xml, folder, Today()),
+        "<c subsequence=\"/b (x,y)/a*b &quot;q&quot; &amp; &lt;z&gt;\\w" + kSep + "s.las\"/>");
     EXPECT_EQ(Substitute("@DEMO@", FileKind::Plain, folder, Today()), folder);
 }
 
@@ -101,12 +112,12 @@ TEST_F(DemoInstanceTest, TheInstanceHoldsEverySourceWithItsPlaceholdersReplaced)
     Instantiate(source, target, Options());
 
     const std::string store = testsupport::ReadFileBytes(target + "/registry.reg");
-    EXPECT_THAT(store, HasSubstr("\"AppPath\"=\"" + target + "/app\""));
+    EXPECT_THAT(store, HasSubstr("\"AppPath\"=" + testsupport::RegText(target + kSep + "app")));
     EXPECT_THAT(store, ::testing::Not(HasSubstr("@")));
     EXPECT_THAT(testsupport::ReadFileBytes(target + "/userdata/yearsched.lsc"),
                 HasSubstr("(2031-03-23,"));
     EXPECT_THAT(testsupport::ReadFileBytes(target + "/data/shows/Evening.lss"),
-                HasSubstr("(" + target + "/data/sequences/Intro.las)"));
+                HasSubstr("(" + target + kSep + "data" + kSep + "sequences" + kSep + "Intro.las)"));
     EXPECT_TRUE(fs::exists(target + "/.vantori-demo"));
     EXPECT_FALSE(fs::exists(target + "/app-versions.txt"));
 

@@ -99,7 +99,13 @@ void WriteFileBytes(const std::string& path, const std::string& bytes) {
 StoreTest::StoreTest()
     : storeFile_(folder_.File("registry.reg")),
       store_(storeFile_),
-      tmpdir_("TMPDIR", folder_.File("tmp")) {
+      tmpdir_("TMPDIR", folder_.File("tmp"))
+#ifdef _WIN32
+      ,
+      tmp_("TMP", folder_.File("tmp")),
+      mediaPlayer_(MediaPlayerProbe::StoredVersionText)
+#endif
+{
     fs::create_directories(TempDir());
 }
 

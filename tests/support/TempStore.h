@@ -8,6 +8,10 @@
 
 #include "environment/RegistryStore.h"
 
+#ifdef _WIN32
+#include "environment/MediaPlayerProbe.h"
+#endif
+
 // Test support for anything that touches files or the settings store. Tests never use the
 // real user's settings or temporary files:
 //
@@ -70,7 +74,9 @@ void WriteFileBytes(const std::string& path, const std::string& bytes);
 
 // A test with its own temporary folder, a store file "registry.reg" in it (missing until
 // written: an empty store) selected for the test, and TMPDIR pointing into the folder so
-// that temporary files land there too.
+// that temporary files land there too (on Windows TMP as well, which the system's
+// temporary-folder service reads). On Windows the media player's version comes from the
+// test's store, as it does elsewhere, rather than from the machine's own player.
 class StoreTest : public ::testing::Test {
   protected:
     StoreTest();
@@ -87,6 +93,10 @@ class StoreTest : public ::testing::Test {
     std::string storeFile_;
     ScopedStore store_;
     ScopedEnvironment tmpdir_;
+#ifdef _WIN32
+    ScopedEnvironment tmp_;
+    MediaPlayerProbe::ScopedVersionSource mediaPlayer_;
+#endif
 };
 
 }  // namespace vtr::testsupport

@@ -86,6 +86,10 @@ class SuiteTest : public StoreTest {
     std::string AppFolder() const { return folder_.File("app") + kSep; }
     std::string DataFolder() const { return folder_.File("data") + kSep; }
     std::string DataFile(const std::string& name) const { return DataFolder() + name; }
+    // A file in the media folder, named as the suite's folders join names on this platform.
+    std::string MediaFile(const std::string& name) const {
+        return DataFolder() + "media" + kSep + name;
+    }
 
     // The store's sections for this suite; a test changes them and calls WriteSuiteStore.
     StoreSections store;

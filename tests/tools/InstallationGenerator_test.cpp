@@ -11,6 +11,7 @@
 
 #include "engine/LibVerify.h"
 #include "environment/LibFile.h"
+#include "environment/MediaPlayerProbe.h"
 #include "environment/VTRCommon.h"
 #include "schedule/Schedule.h"
 #include "schedule/YearSchedule.h"
@@ -58,6 +59,10 @@ class InstallationGeneratorTest : public ::testing::Test {
         testsupport::ScopedStore store(installation.registryFile);
         fs::create_directories(folder.File("tmp"));
         testsupport::ScopedEnvironment tmpdir("TMPDIR", folder.File("tmp"));
+#ifdef _WIN32
+        testsupport::ScopedEnvironment tmp("TMP", folder.File("tmp"));
+        MediaPlayerProbe::ScopedVersionSource player(MediaPlayerProbe::StoredVersionText);
+#endif
         ScopedNowSource now([] { return DateTime::FromParts(2031, 12, 30, 12); });
         const std::string storeBefore = ReadFileBytes(installation.registryFile);
         LibVerify::SetScheduleFiles(VTRCommon::GetWeeklyScheduleFile(),
@@ -75,8 +80,10 @@ class InstallationGeneratorTest : public ::testing::Test {
 TEST_F(InstallationGeneratorTest, WritesTheFoldersStoreSchedulesShowsAndSequences) {
     const auto installation = gen::MakeInstallation(folder.Path(), SmallOptions());
     const std::string store = ReadFileBytes(installation.registryFile);
-    EXPECT_THAT(store, HasSubstr("\"UserDataPath\"=\"" + installation.userDataFolder + "\""));
-    EXPECT_THAT(store, HasSubstr("\"MediaDataPath\"=\"" + installation.mediaFolder + "\""));
+    EXPECT_THAT(store,
+                HasSubstr("\"UserDataPath\"=" + testsupport::RegText(installation.userDataFolder)));
+    EXPECT_THAT(store,
+                HasSubstr("\"MediaDataPath\"=" + testsupport::RegText(installation.mediaFolder)));
     EXPECT_THAT(store, HasSubstr("[HKEY_CURRENT_USER\\Software\\Vantori\\Shared\\Network1\\AuxO]"));
     EXPECT_THAT(store, HasSubstr("\\DMX500]\r\n\"Adapter\"=\"USB DMX 500\""));
 

@@ -1,0 +1,131 @@
+#!/usr/bin/env bash
+# The Windows job: builds the verifier, its core tests and the demo installation for 64-bit
+# Windows with mingw-w64, runs the tests under Wine, then verifies the demo installation
+# under Wine with its settings imported into Wine's registry, and checks that the results
+# are those of the Linux build, paths aside.
+#
+# Folders (each may be set from outside):
+#   VTR_WINDOWS_BUILD_DIR  the Windows build, default build-windows; its Wine prefix is
+#                          build-windows/wineprefix, never the user's ~/.wine
+#   VTR_WINDOWS_DEPS       pugixml and GoogleTest built for Windows, default build-windows-deps
+#   VTR_BUILD_DIR          the Linux build to compare with, default build (made when missing)
+set -euo pipefail
+root=$(cd "$(dirname "$0")/.." && pwd)
+build=${VTR_WINDOWS_BUILD_DIR:-$root/build-windows}
+deps=${VTR_WINDOWS_DEPS:-$root/build-windows-deps}
+linux=${VTR_BUILD_DIR:-$root/build}
+prefix=$build/wineprefix
+wine_run=("$root/scripts/wine-run.sh" --prefix "$prefix")
+jobs=${VTR_JOBS:-2}
+
+start=$(date +%s)
+step() { echo; echo "=== windows: $1 ($(($(date +%s) - start))s)"; }
+
+# Wine's server outlives the programs for a while; the job leaves none behind.
+stop_wine() {
+    if [ -f "$prefix/system.reg" ]; then
+        "${wine_run[@]}" --stop
+    fi
+}
+trap stop_wine EXIT
+
+step "packages"
+"$root/scripts/setup-deps.sh" g++-mingw-w64-x86-64-posix libz-mingw-w64-dev wine wine64 jq dpkg-dev
+
+step "libraries for Windows"
+VTR_JOBS=$jobs "$root/scripts/build-windows-deps.sh" "$deps"
+
+step "Wine prefix"
+# Made before the build, whose steps under Wine (the listing of the tests) have short limits.
+"${wine_run[@]}" cmd /c ver
+
+step "cross build"
+cmake -S "$root" -B "$build" -G Ninja -DCMAKE_TOOLCHAIN_FILE="$root/cmake/mingw-w64-x86_64.cmake" \
+    -DVTR_WINDOWS_DEPS="$deps" -DVTR_BUILD_UI=OFF -DVTR_BUILD_TESTS=ON >/dev/null
+# The build runs programs under Wine (making the demo, listing the tests).
+cmake --build "$build" -j "$jobs" 2>&1 | tee "$build/build.log"
+if grep -q "warning:" "$build/build.log"; then
+    echo "windows: the cross build has warnings:" >&2
+    grep "warning:" "$build/build.log" >&2
+    exit 1
+fi
+
+step "tests under Wine"
+ctest --test-dir "$build" --output-on-failure -j "$jobs" --timeout 300
+
+step "the demo installation under Wine"
+demo=$build/demo
+[ -f "$demo/registry.reg" ] || { echo "windows: no demo installation in $demo" >&2; exit 1; }
+if [ ! -x "$linux/src/cli/vantori-verify" ] || [ ! -f "$linux/demo/registry.reg" ]; then
+    cmake -S "$root" -B "$linux" -G Ninja -DVTR_BUILD_UI=OFF >/dev/null
+    cmake --build "$linux" -j "$jobs" --target vantori-verify demo
+fi
+
+# The Windows build made its demo under Wine, so the demo's settings name its folders as
+# Windows sees them; a folder still named as the host names it becomes the Z: path.
+demo_unix=$(cd "$demo" && pwd)
+demo_windows=$("${wine_run[@]}" winepath -w "$demo_unix")
+work=$(mktemp -d)
+trap 'rm -rf "$work"; stop_wine' EXIT
+sed -e "s|$demo_unix|$(printf '%s' "$demo_windows" | sed 's/\\/\\\\\\\\/g')|g" \
+    "$demo/registry.reg" >"$work/registry.reg"
+if ! grep -qF 'Z:\\' "$work/registry.reg"; then
+    echo "windows: the demo's settings name no Wine path:" >&2
+    cat "$work/registry.reg" >&2
+    exit 1
+fi
+"${wine_run[@]}" reg delete 'HKCU\Software\Vantori' /f >/dev/null 2>&1 || true
+"${wine_run[@]}" reg import "$("${wine_run[@]}" winepath -w "$work/registry.reg")"
+
+snapshot() { (cd "$1" && find . -type f -print0 | sort -z | xargs -0 sha256sum); }
+snapshot "$demo" >"$work/demo-before"
+temp_windows=$("${wine_run[@]}" cmd /c echo %TEMP%)
+temp_unix=$("${wine_run[@]}" winepath -u "$temp_windows")
+ls -A "$temp_unix" >"$work/temp-before" 2>/dev/null || true
+
+set +e
+env -u VANTORI_REGISTRY "${wine_run[@]}" "$build/src/cli/vantori-verify.exe" --schedule \
+    --format json --quiet >"$work/windows.json"
+windows_status=$?
+"$linux/src/cli/vantori-verify" --schedule --format json --quiet \
+    --registry "$linux/demo/registry.reg" >"$work/linux.json"
+linux_status=$?
+set -e
+
+# Message numbers, severities, summaries, ignored flags and the counts; the details hold the
+# installation's paths, which differ.
+findings() {
+    jq '{checksPerformed, errors, warnings, cancelled,
+         results: [.results[] | {severity, messageNumber, helpContextId, summary, ignored,
+                                 details: (.details | length)}]}' "$1"
+}
+findings "$work/windows.json" >"$work/windows.findings"
+findings "$work/linux.json" >"$work/linux.findings"
+echo "Linux exit status $linux_status, Windows exit status $windows_status"
+jq -r '.results[] | "\(.severityText) \(.messageNumber): \(.summary)\(if .ignored then " (ignored)" else "" end)"' \
+    "$work/windows.json"
+failed=0
+if [ "$windows_status" -ne "$linux_status" ]; then
+    echo "windows: the exit statuses differ" >&2
+    failed=1
+fi
+if ! diff -u "$work/linux.findings" "$work/windows.findings"; then
+    echo "windows: the results under Wine differ from those on Linux" >&2
+    failed=1
+fi
+if [ "$(jq '.results | length' "$work/windows.json")" -lt 5 ]; then
+    echo "windows: the demo gave too few results to compare" >&2
+    failed=1
+fi
+snapshot "$demo" >"$work/demo-after"
+if ! diff -q "$work/demo-before" "$work/demo-after" >/dev/null; then
+    echo "windows: the verification changed the demo installation" >&2
+    failed=1
+fi
+ls -A "$temp_unix" >"$work/temp-after" 2>/dev/null || true
+if ! diff "$work/temp-before" "$work/temp-after"; then
+    echo "windows: the verification left temporary files behind" >&2
+    failed=1
+fi
+[ "$failed" -eq 0 ] || exit 1
+step "done"

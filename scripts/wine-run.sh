@@ -1,0 +1,80 @@
+#!/usr/bin/env bash
+# Runs a Windows program under Wine, headless and with bounded time:
+#   wine-run.sh [--prefix DIR] PROGRAM.exe [ARGUMENTS...]
+#   wine-run.sh [--prefix DIR] --stop          (ends the prefix's Wine server and helpers)
+# The Wine prefix is DIR, else $WINEPREFIX; the user's own ~/.wine is never used. A missing
+# prefix is made first (once, under a lock, so parallel build steps can share it). No X
+# display is needed: the programs are console programs, and the parts of Wine that would
+# download or show something (its .NET and HTML engines, the menu builder) are turned off.
+# Wine's runtime files go into the prefix, not the system's temporary folder.
+#
+# Wine's server and its background processes (services, the desktop) outlive the program
+# and keep the standard streams they were started with, so a caller reading the program's
+# output through a pipe (ctest) would wait for them: they are started here first, detached.
+# The program's text output ends its lines with CR LF, as on Windows; they reach the host
+# with LF only, so that tools reading it (ctest's listing of the tests, say) see plain lines.
+# VTR_WINE_TIMEOUT (seconds, default 1200) bounds one program's run; the exit status is the
+# program's own (124 after a time-out). The server stays VTR_WINESERVER_PERSIST seconds
+# (default 30) after the last program, so that a series of runs shares it.
+set -euo pipefail
+
+prefix=${WINEPREFIX:-}
+if [ "${1:-}" = "--prefix" ]; then
+    prefix=$2
+    shift 2
+fi
+if [ -z "$prefix" ] || [ $# -eq 0 ]; then
+    echo "usage: wine-run.sh [--prefix DIR] PROGRAM [ARGUMENTS...] | --stop (or set WINEPREFIX)" >&2
+    exit 2
+fi
+mkdir -p "$prefix"
+prefix=$(cd "$prefix" && pwd)
+
+wine=$(command -v wine || command -v wine64 || true)
+server=$(command -v wineserver || true)
+if [ -z "$wine" ] || [ -z "$server" ]; then
+    echo "wine-run.sh: Wine is not installed" >&2
+    exit 127
+fi
+
+export WINEPREFIX=$prefix
+export WINEDEBUG=${WINEDEBUG:--all}
+export WINEDLLOVERRIDES="mscoree=d;mshtml=d;winemenubuilder.exe=d"
+export WINEARCH=win64
+export TMPDIR=$prefix/.runtime
+mkdir -p "$TMPDIR"
+unset DISPLAY WAYLAND_DISPLAY
+
+if [ "$1" = "--stop" ]; then
+    timeout 30 "$server" -k </dev/null >/dev/null 2>&1 || true
+    timeout 30 "$server" -w </dev/null >/dev/null 2>&1 || true
+    exit 0
+fi
+
+limit=${VTR_WINE_TIMEOUT:-1200}
+persist=${VTR_WINESERVER_PERSIST:-30}
+
+(
+    flock 9
+    # The prefix, made once.
+    if [ ! -f "$prefix/system.reg" ]; then
+        timeout --kill-after=10 "$limit" "$wine" wineboot --init </dev/null >/dev/null 2>&1 9>&- ||
+            true
+        timeout --kill-after=10 "$limit" "$server" -w </dev/null >/dev/null 2>&1 9>&- || true
+        if [ ! -f "$prefix/system.reg" ]; then
+            echo "wine-run.sh: could not make the Wine prefix $prefix" >&2
+            exit 1
+        fi
+    fi
+    # A server that was not running yet (status 0): it and the helpers, detached. (None of
+    # them may keep the lock's descriptor, or the lock would last as long as they do.)
+    if "$server" -p"$persist" </dev/null >/dev/null 2>&1 9>&-; then
+        timeout --kill-after=10 120 "$wine" rundll32.exe user32.dll,GetDesktopWindow \
+            </dev/null >/dev/null 2>&1 9>&- || true
+    fi
+) 9>"$prefix.lock"
+
+set +e
+timeout --kill-after=10 "$limit" "$wine" "$@" | tr -d '\r'
+status=${PIPESTATUS[0]}
+exit "$status"
