@@ -18,8 +18,9 @@
 namespace vtr::MediaPlayerProbe {
 namespace {
 
-constexpr const char* kSource = "MediaPlayerProbe.VersionText";
 #ifdef _WIN32
+// COM failures are reported under this source; only Windows asks the player itself.
+constexpr const char* kSource = "MediaPlayerProbe.VersionText";
 constexpr const char* kControlProgId = "WMPlayer.OCX";
 #endif
 

@@ -261,7 +261,9 @@ std::optional<Stamp> StampOf(const std::string& path) {
 }
 
 ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
-    const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    // Without waiting: a pipe in the store's place would otherwise block the open until a
+    // writer came. It is refused below, as anything else that is not a regular file is.
+    const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
     if (fd < 0) {
         return errno == ENOENT || errno == ENOTDIR ? ReadOutcome::Missing : ReadOutcome::Failed;
     }

@@ -38,6 +38,14 @@ namespace {
 class FileSource final : public ByteSource {
   public:
     explicit FileSource(const std::string& path) {
+        // A pipe, socket or device is no sequence file; opening a pipe would wait for a
+        // writer that never comes.
+        std::error_code type;
+        const auto status = std::filesystem::status(path, type);
+        if (!type && status.type() != std::filesystem::file_type::regular &&
+            status.type() != std::filesystem::file_type::directory) {
+            FailLoad({}, "the file cannot be read (it is not a regular file)");
+        }
         file_ = std::fopen(path.c_str(), "rb");
         if (file_ == nullptr)
             FailRead(errno);

@@ -28,8 +28,13 @@ int32_t ReadWholeFile(const std::string& path, std::string& text) {
     if (path.empty() || status.type() == std::filesystem::file_type::not_found) {
         return FileErrors::FileNotFound;
     }
-    if (status.type() == std::filesystem::file_type::directory) {
+    if (status.type() != std::filesystem::file_type::regular) {
+        // A folder; or a pipe, which would keep the open waiting for a writer, or a device,
+        // which could be read for ever.
         return FileErrors::PathFileAccessError;
+    }
+    if (std::filesystem::file_size(ToPath(path), ec) > kMaxWholeFileBytes && !ec) {
+        return FileErrors::OutOfMemory;
     }
     FileHandle file(std::fopen(path.c_str(), "rb"));
     if (!file) {
@@ -40,6 +45,9 @@ int32_t ReadWholeFile(const std::string& path, std::string& text) {
     for (;;) {
         const std::size_t got = std::fread(buffer, 1, sizeof buffer, file.get());
         content.append(buffer, got);
+        if (content.size() > kMaxWholeFileBytes) {
+            return FileErrors::OutOfMemory;  // it grew while being read
+        }
         if (got < sizeof buffer) {
             break;
         }
@@ -78,6 +86,8 @@ std::string FileErrorDescription(int32_t number) {
     switch (number) {
         case 0:
             return "";
+        case FileErrors::OutOfMemory:
+            return "Out of memory";
         case FileErrors::FileNotFound:
             return "File not found";
         case FileErrors::DeviceIoError:
