@@ -6,33 +6,12 @@
 //     several members, expanding far beyond its size); the load must fail cleanly or keep a
 //     sequence, and expansion past the limit is refused.
 
-#include <zlib.h>
-
 #include <cstdint>
 #include <string>
 
 #include "FuzzSupport.h"
 #include "SequenceSummary.h"
-
-namespace {
-
-std::string Gzip(std::string_view bytes, int level) {
-    z_stream zs{};
-    if (deflateInit2(&zs, level, Z_DEFLATED, 15 + 16, 8, Z_DEFAULT_STRATEGY) != Z_OK)
-        vtr::fuzz::Fail("deflateInit2", "");
-    std::string out(deflateBound(&zs, static_cast<uLong>(bytes.size())) + 32, '\0');
-    zs.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(bytes.data()));
-    zs.avail_in = static_cast<uInt>(bytes.size());
-    zs.next_out = reinterpret_cast<Bytef*>(out.data());
-    zs.avail_out = static_cast<uInt>(out.size());
-    if (deflate(&zs, Z_FINISH) != Z_STREAM_END)
-        vtr::fuzz::Fail("deflate", "");
-    out.resize(zs.total_out);
-    deflateEnd(&zs);
-    return out;
-}
-
-}  // namespace
+#include "sequencelib/SequenceGenerator.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, std::size_t size) {
     std::string_view input = vtr::fuzz::AsText(data, size);
@@ -45,7 +24,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, std::size_t size) {
     options.pieceBytes = (mode & 2) ? 64 : std::size_t{1} << 20;
 
     if ((mode & 1) == 0) {
-        const std::string compressed = scratch.Write("fuzz.las", Gzip(input, (mode >> 2) % 10));
+        const std::string compressed = scratch.Write(
+            "fuzz.las", vtr::seqlib::SequenceGenerator::Gzip(input, (mode >> 2) % 10));
         const std::string plain = scratch.Write("plain.las", input);
         std::string fromPlain = vtr::fuzz::LoadSummary(plain, options, context);
         const std::string fromCompressed = vtr::fuzz::LoadSummary(compressed, options, context);

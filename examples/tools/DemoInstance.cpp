@@ -1,7 +1,5 @@
 #include "DemoInstance.h"
 
-#include <zlib.h>
-
 #include <algorithm>
 #include <cctype>
 #include <charconv>
@@ -14,6 +12,7 @@
 
 #include "checks/CheckAppFileExists.h"
 #include "checks/CheckAppPathExists.h"
+#include "sequencelib/SequenceGenerator.h"
 #include "show/Serialize.h"
 
 namespace vtr::demo {
@@ -44,24 +43,6 @@ void WriteFile(const fs::path& path, const std::string& bytes) {
     out.close();
     if (!out)
         Fail("cannot write " + path.string());
-}
-
-std::string Gzip(const std::string& bytes, const std::string& name) {
-    z_stream stream{};
-    if (deflateInit2(&stream, Z_BEST_COMPRESSION, Z_DEFLATED, 15 + 16, 8, Z_DEFAULT_STRATEGY) !=
-        Z_OK)
-        Fail("cannot compress " + name);
-    std::string out(deflateBound(&stream, static_cast<uLong>(bytes.size())) + 64, '\0');
-    stream.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(bytes.data()));
-    stream.avail_in = static_cast<uInt>(bytes.size());
-    stream.next_out = reinterpret_cast<Bytef*>(out.data());
-    stream.avail_out = static_cast<uInt>(out.size());
-    const int status = deflate(&stream, Z_FINISH);
-    out.resize(stream.total_out);
-    deflateEnd(&stream);
-    if (status != Z_STREAM_END)
-        Fail("cannot compress " + name);
-    return out;
 }
 
 bool EndsWith(const std::string& text, const std::string& suffix) {
@@ -315,7 +296,7 @@ void Instantiate(const std::string& sourceFolder, const std::string& targetFolde
             Fail(file.string() + ": " + error.what());
         }
         if (compress)
-            bytes = Gzip(bytes, file.string());
+            bytes = seqlib::SequenceGenerator::Gzip(bytes, 9);
 
         const fs::path destination = target / fs::path(name);
         std::error_code error;

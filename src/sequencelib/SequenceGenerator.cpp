@@ -7,6 +7,7 @@
 #include <charconv>
 #include <cstdio>
 #include <functional>
+#include <limits>
 #include <system_error>
 
 #include "engine/VtrError.h"
@@ -174,6 +175,26 @@ Written Generate(const Options& o, const std::function<void(std::string&)>& flus
 }
 
 }  // namespace
+
+std::string Gzip(std::string_view bytes, int level) {
+    constexpr const char* kSource = "SequenceGenerator.Gzip";
+    if (bytes.size() > std::numeric_limits<uInt>::max() / 2)
+        Raise(ErrorNumbers::UserMessage, kSource, "Too much to compress in one piece");
+    z_stream zs{};
+    if (deflateInit2(&zs, level, Z_DEFLATED, 15 + 16, 8, Z_DEFAULT_STRATEGY) != Z_OK)
+        Raise(ErrorNumbers::UserMessage, kSource, "Cannot start compressing");
+    std::string out(deflateBound(&zs, static_cast<uLong>(bytes.size())) + 32, '\0');
+    zs.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(bytes.data()));
+    zs.avail_in = static_cast<uInt>(bytes.size());
+    zs.next_out = reinterpret_cast<Bytef*>(out.data());
+    zs.avail_out = static_cast<uInt>(out.size());
+    const int status = deflate(&zs, Z_FINISH);
+    out.resize(zs.total_out);
+    deflateEnd(&zs);
+    if (status != Z_STREAM_END)
+        Raise(ErrorNumbers::UserMessage, kSource, "Cannot compress");
+    return out;
+}
 
 int32_t ChannelNetwork(int32_t index) {
     return index / 3840 % 16;

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 // Writes valid sequence files of a chosen shape and size, for benchmarks and tests.
 namespace vtr::seqlib::SequenceGenerator {
@@ -42,6 +43,10 @@ std::string Xml(const Options& options);
 // Writes the file, gzip-compressed when options.compressed. Raises VtrError when the
 // file cannot be written.
 Written WriteFile(const std::string& path, const Options& options);
+
+// The bytes as one gzip member, at zlib's compression level (0 to 9, -1 for its default):
+// how the suite compresses sequence and edit files. Raises VtrError when zlib refuses.
+std::string Gzip(std::string_view bytes, int level = -1);
 
 // The events per channel that give a text of about targetBytes with that many channels.
 int32_t EventsPerChannelFor(std::uint64_t targetBytes, int32_t channels);

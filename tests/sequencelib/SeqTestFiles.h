@@ -1,7 +1,5 @@
 #pragma once
 
-#include <zlib.h>
-
 #include <atomic>
 #include <chrono>
 #include <filesystem>
@@ -10,6 +8,7 @@
 #include <string>
 
 #include "engine/VtrError.h"
+#include "sequencelib/SequenceGenerator.h"
 
 // Fixture files for the sequence library's tests: a private temporary folder that is
 // removed with everything in it, and gzip data made in memory.
@@ -48,24 +47,7 @@ class TempFolder {
     std::filesystem::path path_;
 };
 
-// The bytes as one gzip member.
-inline std::string Gzip(const std::string& bytes, int level = Z_DEFAULT_COMPRESSION) {
-    z_stream zs{};
-    if (deflateInit2(&zs, level, Z_DEFLATED, 15 + 16, 8, Z_DEFAULT_STRATEGY) != Z_OK) {
-        throw std::runtime_error("deflateInit2");
-    }
-    std::string out(deflateBound(&zs, static_cast<uLong>(bytes.size())) + 32, '\0');
-    zs.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(bytes.data()));
-    zs.avail_in = static_cast<uInt>(bytes.size());
-    zs.next_out = reinterpret_cast<Bytef*>(out.data());
-    zs.avail_out = static_cast<uInt>(out.size());
-    const int rc = deflate(&zs, Z_FINISH);
-    out.resize(zs.total_out);
-    deflateEnd(&zs);
-    if (rc != Z_STREAM_END)
-        throw std::runtime_error("deflate");
-    return out;
-}
+using SequenceGenerator::Gzip;
 
 // The description of the VtrError that the call raises, or "(no error)".
 template <typename F>

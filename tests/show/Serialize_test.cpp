@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "engine/VtrError.h"
+#include "support/LiteralListReader.h"
 
 namespace vtr {
 namespace {
@@ -32,77 +33,11 @@ Outcome Fast(const std::string& text) {
     }
 }
 
-// The list reader exactly as the notation defines it, step by step, on 1-based positions:
-// every round searches the remaining text again and every item cut copies the rest. A
-// repeated state means that it would never finish.
+// The defining algorithm's reading, in the same terms.
 Outcome StepByStep(const std::string& text) {
-    auto find = [](const std::string& s, char ch, std::size_t from) -> std::size_t {
-        if (from < 1 || from > s.size()) {
-            return 0;
-        }
-        const auto at = s.find(ch, from - 1);
-        return at == std::string::npos ? 0 : at + 1;
-    };
-    const std::size_t open = find(text, '(', 1);
-    const auto last = text.rfind(')');
-    const std::size_t close = last == std::string::npos ? 0 : last + 1;
-    if (open == 0 && close == 0) {
-        return {};
-    }
-    if (!(open != 0 && close != 0 && open < close)) {
-        return {{}, 1};
-    }
-    std::string inner = text.substr(open, close - open - 1);
-    long depth = 0;
-    std::size_t start = 1;
-    Items items;
-    std::size_t p = find(inner, '(', 1), c = find(inner, ')', 1), k = find(inner, ',', 1);
-    std::set<std::pair<std::size_t, long>> seen;
-    for (;;) {
-        if (k < 1 && depth < 1) {
-            break;
-        }
-        if (!seen.insert({start, depth}).second) {
-            return {{}, 0, true};
-        }
-        bool takeItem = false;
-        if (depth != 0) {
-            if (c == 0) {
-                return {{}, 4};
-            }
-            if (p < 1 || p >= c) {
-                start = c + 1;
-                --depth;
-            } else {
-                start = p + 1;
-                ++depth;
-            }
-        } else if (c >= p && (p != 0 || c != 0)) {
-            if (k >= p) {
-                depth = 1;
-                start = p + 1;
-            } else {
-                takeItem = true;
-            }
-        } else if (c >= p) {
-            takeItem = true;
-        } else if (c != 0) {
-            return {{}, 3};
-        } else {
-            return {{}, 2};
-        }
-        if (takeItem) {
-            items.push_back(inner.substr(0, k - 1));
-            inner = inner.substr(k);
-            start = 1;
-            seen.clear();
-        }
-        p = find(inner, '(', start);
-        c = find(inner, ')', start);
-        k = find(inner, ',', start);
-    }
-    items.push_back(inner);
-    return {items, 0};
+    const auto reading = testsupport::ReadListLiterally(text);
+    return {reading.items, reading.error,
+            reading.kind == testsupport::LiteralReading::Kind::Endless};
 }
 
 void ExpectError(const std::string& text, int32_t number, const std::string& description) {
