@@ -7,25 +7,16 @@
 #include "environment/LibRegistryVTR.h"
 #include "environment/LibRegistryVTRShared.h"
 #include "environment/RegistryStore.h"
+#include "support/Raised.h"
 #include "support/TempStore.h"
 
 namespace vtr {
 namespace {
 
+using testsupport::RaisedDescription;
 using namespace LibRegistry;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
-
-// Runs the operation and gives the description of the error it raised ("" when none).
-template <typename Operation>
-std::string RaisedDescription(Operation&& operation) {
-    try {
-        operation();
-    } catch (const VtrError& error) {
-        return error.Description();
-    }
-    return "";
-}
 
 const char kHeader[] = "Windows Registry Editor Version 5.00\n\n";
 

@@ -16,24 +16,16 @@
 #include "engine/VtrError.h"
 #include "environment/LibRegistry.h"
 #include "environment/RegistryStore.h"
+#include "support/Raised.h"
 #include "support/TempStore.h"
 
 namespace vtr {
 namespace {
 
+using testsupport::RaisedDescription;
 using namespace LibRegistry;
 using RegistryStore::Backend;
 namespace Status = RegistryStore::StatusCode;
-
-template <typename Operation>
-std::string RaisedDescription(Operation&& operation) {
-    try {
-        operation();
-    } catch (const VtrError& error) {
-        return error.Description();
-    }
-    return "";
-}
 
 // A key name no other test process (ctest runs several at once) uses.
 std::string UniqueTestKey() {

@@ -6,22 +6,15 @@
 #include "show/InteractiveGroup.h"
 #include "show/Trigger.h"
 #include "show/TriggeredSequences.h"
+#include "support/Raised.h"
 
 namespace vtr {
 namespace {
 
+using testsupport::RaisedNumber;
 using namespace TriggerFunctions;
 using namespace TriggeredSequencesFunctions;
 using namespace InteractiveGroupFunctions;
-
-int32_t ErrorOf(const std::function<void()>& step) {
-    try {
-        step();
-    } catch (const VtrError& e) {
-        return e.Number();
-    }
-    return 0;
-}
 
 TEST(Trigger, EqualityIgnoresTheName) {
     const auto a = CreateTrigger(1, 3, 2, "Front door");
@@ -39,11 +32,11 @@ TEST(Trigger, EqualityIgnoresTheName) {
     EXPECT_EQ(read->Name(), "Front door");
     EXPECT_EQ(read->UnitId(), 3);
     EXPECT_EQ(read->Network(), 0);
-    EXPECT_EQ(ErrorOf([] { TriggerFromText("( 2,Front door, 3)"); }),
+    EXPECT_EQ(RaisedNumber([] { TriggerFromText("( 2,Front door, 3)"); }),
               ErrorNumbers::SubscriptOutOfRange);
-    EXPECT_EQ(ErrorOf([] { TriggerFromText("( 2,Front door, x, 0)"); }),
+    EXPECT_EQ(RaisedNumber([] { TriggerFromText("( 2,Front door, x, 0)"); }),
               ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { TriggerToText(TriggerPtr()); }), ErrorNumbers::ObjectNotSet);
+    EXPECT_EQ(RaisedNumber([] { TriggerToText(TriggerPtr()); }), ErrorNumbers::ObjectNotSet);
 }
 
 TEST(TriggeredSequences, ReadsTheTriggerFromTheSecondPlace) {
@@ -58,16 +51,18 @@ TEST(TriggeredSequences, ReadsTheTriggerFromTheSecondPlace) {
     EXPECT_EQ(set->Sequence(1), "Outro.lms");
     EXPECT_EQ(TriggeredSequencesToText(*set), "(Intro.lms,( 2,Front door, 3, 0),Outro.lms)");
 
-    EXPECT_EQ(ErrorOf([] { TriggeredSequencesFromText("(Intro.lms)"); }),
+    EXPECT_EQ(RaisedNumber([] { TriggeredSequencesFromText("(Intro.lms)"); }),
               ErrorNumbers::SubscriptOutOfRange);
     TriggeredSequences empty;
     empty.SetTrig(CreateTrigger(0, 1, 1, ""));
-    EXPECT_EQ(ErrorOf([&] { TriggeredSequencesToText(empty); }), ErrorNumbers::SubscriptOutOfRange);
+    EXPECT_EQ(RaisedNumber([&] { TriggeredSequencesToText(empty); }),
+              ErrorNumbers::SubscriptOutOfRange);
     TriggeredSequences untriggered;
     untriggered.AddSequence("a.lms");
-    EXPECT_EQ(ErrorOf([&] { TriggeredSequencesToText(untriggered); }), ErrorNumbers::ObjectNotSet);
-    EXPECT_EQ(ErrorOf([&] { untriggered.Sequence(1); }), ErrorNumbers::SubscriptOutOfRange);
-    EXPECT_EQ(ErrorOf([&] { untriggered.SetSequence(-1, "x"); }),
+    EXPECT_EQ(RaisedNumber([&] { TriggeredSequencesToText(untriggered); }),
+              ErrorNumbers::ObjectNotSet);
+    EXPECT_EQ(RaisedNumber([&] { untriggered.Sequence(1); }), ErrorNumbers::SubscriptOutOfRange);
+    EXPECT_EQ(RaisedNumber([&] { untriggered.SetSequence(-1, "x"); }),
               ErrorNumbers::SubscriptOutOfRange);
 }
 
@@ -147,7 +142,8 @@ TEST(InteractiveGroup, TextRoundTrips) {
     back->DeleteTriggeredSequence(0);
     EXPECT_EQ(back->Count(), 1);
     EXPECT_EQ(back->GetTriggeredSequences(0)->Trig()->Name(), "B");
-    EXPECT_EQ(ErrorOf([&] { back->GetTriggeredSequences(1); }), ErrorNumbers::SubscriptOutOfRange);
+    EXPECT_EQ(RaisedNumber([&] { back->GetTriggeredSequences(1); }),
+              ErrorNumbers::SubscriptOutOfRange);
 
     InteractiveGroup copy;
     copy.Copy(group);
@@ -162,11 +158,11 @@ TEST(InteractiveGroup, ReadingRules) {
     EXPECT_EQ(noField8->TypeName(), "Magic Toy");
     // The count field is ignored: the list of sets decides.
     EXPECT_EQ(InteractiveGroupFromText("( 9,,F,F,T,n,((a,( 1,, 1, 0))),F)")->Count(), 1);
-    EXPECT_EQ(ErrorOf([] { InteractiveGroupFromText("( 0,,F,F,T,n,,T)"); }),
+    EXPECT_EQ(RaisedNumber([] { InteractiveGroupFromText("( 0,,F,F,T,n,,T)"); }),
               ErrorNumbers::SubscriptOutOfRange);
-    EXPECT_EQ(ErrorOf([] { InteractiveGroupFromText("( 1,,F,F,T,n,((a)),T)"); }),
+    EXPECT_EQ(RaisedNumber([] { InteractiveGroupFromText("( 1,,F,F,T,n,((a)),T)"); }),
               ErrorNumbers::SubscriptOutOfRange);
-    EXPECT_EQ(ErrorOf([] { InteractiveGroupToText(InteractiveGroup()); }),
+    EXPECT_EQ(RaisedNumber([] { InteractiveGroupToText(InteractiveGroup()); }),
               ErrorNumbers::SubscriptOutOfRange);
 }
 

@@ -11,11 +11,13 @@
 
 #include "engine/VtrError.h"
 #include "support/LiteralListReader.h"
+#include "support/Raised.h"
 
 namespace vtr {
 namespace {
 
 using Serialize::ListFromText;
+using testsupport::RaisedNumber;
 using Items = std::vector<std::string>;
 
 // What a read gives: the items, or the number of the error raised.
@@ -226,15 +228,6 @@ TEST(Escaping, RoundTripsAndMatchesTheReplacements) {
     }
 }
 
-int32_t ErrorOf(const std::function<void()>& step) {
-    try {
-        step();
-    } catch (const VtrError& e) {
-        return e.Number();
-    }
-    return 0;
-}
-
 TEST(NumbersAndBooleans, ConvertAsStored) {
     EXPECT_EQ(Serialize::LongToText(0), " 0");
     EXPECT_EQ(Serialize::LongToText(2), " 2");
@@ -246,13 +239,13 @@ TEST(NumbersAndBooleans, ConvertAsStored) {
     EXPECT_EQ(Serialize::TextToLong("-1.5"), -2);
     EXPECT_EQ(Serialize::TextToLong("+4e2"), 400);
     EXPECT_EQ(Serialize::TextToLong("-2147483648"), -2147483647 - 1);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong(""); }), ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("  "); }), ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("abc"); }), ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("1 2"); }), ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("inf"); }), ErrorNumbers::TypeMismatch);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("2147483648"); }), ErrorNumbers::Overflow);
-    EXPECT_EQ(ErrorOf([] { Serialize::TextToLong("1e999"); }), ErrorNumbers::Overflow);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong(""); }), ErrorNumbers::TypeMismatch);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("  "); }), ErrorNumbers::TypeMismatch);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("abc"); }), ErrorNumbers::TypeMismatch);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("1 2"); }), ErrorNumbers::TypeMismatch);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("inf"); }), ErrorNumbers::TypeMismatch);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("2147483648"); }), ErrorNumbers::Overflow);
+    EXPECT_EQ(RaisedNumber([] { Serialize::TextToLong("1e999"); }), ErrorNumbers::Overflow);
     EXPECT_EQ(Serialize::TextToLong("1e-999"), 0);
 
     EXPECT_EQ(Serialize::LeadingNumber("12abc"), 12);
@@ -262,7 +255,7 @@ TEST(NumbersAndBooleans, ConvertAsStored) {
     EXPECT_EQ(Serialize::RoundToLong(2.5), 2);
     EXPECT_EQ(Serialize::RoundToLong(3.5), 4);
     EXPECT_EQ(Serialize::RoundToLong(-2.5), -2);
-    EXPECT_EQ(ErrorOf([] { Serialize::RoundToLong(3e9); }), ErrorNumbers::Overflow);
+    EXPECT_EQ(RaisedNumber([] { Serialize::RoundToLong(3e9); }), ErrorNumbers::Overflow);
 
     EXPECT_EQ(Serialize::BoolToText(true), "T");
     EXPECT_EQ(Serialize::BoolToText(false), "F");

@@ -10,25 +10,18 @@
 #include "show/Serialize.h"
 #include "show/TempFolder.h"
 #include "show/WholeFile.h"
+#include "support/Raised.h"
 
 namespace vtr {
 namespace {
 
+using testsupport::RaisedNumber;
 using namespace ShowFunctions;
 using namespace PlaylistFunctions;
 
 constexpr const char* kNewShowText =
     "((0,1,2,0,,,T,F,F),(0,1,2,0,,,T,F,F),(1,0,1,0,,,T,F,F),(0,1,2,0,,,T,F,F),,"
     "(2,0,1,0,,,T,F,F),, 0,,F)";
-
-int32_t ErrorOf(const std::function<void()>& step) {
-    try {
-        step();
-    } catch (const VtrError& e) {
-        return e.Number();
-    }
-    return 0;
-}
 
 TEST(Playlist, TypeSetterKeepsTheNumbersConsistent) {
     Playlist playlist;
@@ -92,8 +85,9 @@ TEST(Playlist, TextRoundTripsAndReadsLeniently) {
     EXPECT_EQ(lenient->Delay(), 0);
     EXPECT_EQ(lenient->List(), std::vector<std::string>{""});  // "()" names one empty file
 
-    EXPECT_EQ(ErrorOf([] { PlaylistFromText("(1,0,1,0,)"); }), ErrorNumbers::SubscriptOutOfRange);
-    EXPECT_EQ(ErrorOf([] { PlaylistFromText("(1,0,1,0,,(a)"); }), 2);
+    EXPECT_EQ(RaisedNumber([] { PlaylistFromText("(1,0,1,0,)"); }),
+              ErrorNumbers::SubscriptOutOfRange);
+    EXPECT_EQ(RaisedNumber([] { PlaylistFromText("(1,0,1,0,,(a)"); }), 2);
 }
 
 TEST(ShowFile, NewShowHasItsDefaultsAndText) {
@@ -211,13 +205,13 @@ TEST(ShowFile, EmptyFieldsForNoGroupsAndNoTrigger) {
 TEST(ShowFile, ShowsThatCannotBeWritten) {
     Show show;
     show.InteractiveGroups().push_back(std::make_shared<InteractiveGroup>());  // no sets
-    EXPECT_EQ(ErrorOf([&] { ShowToText(show); }), ErrorNumbers::SubscriptOutOfRange);
+    EXPECT_EQ(RaisedNumber([&] { ShowToText(show); }), ErrorNumbers::SubscriptOutOfRange);
     EXPECT_FALSE(show.HasSameContents(show));
     Show missing;
     missing.SetMain(nullptr);
-    EXPECT_EQ(ErrorOf([&] { ShowToText(missing); }), ErrorNumbers::ObjectNotSet);
+    EXPECT_EQ(RaisedNumber([&] { ShowToText(missing); }), ErrorNumbers::ObjectNotSet);
 
-    EXPECT_EQ(ErrorOf([] {
+    EXPECT_EQ(RaisedNumber([] {
                   CreateShow(nullptr, NewMusicalPlaylist(1, 0), NewAnimationPlaylist(1),
                              NewMusicalPlaylist(1, 0), NewAnimationPlaylist(2), {}, 0, nullptr,
                              false);
