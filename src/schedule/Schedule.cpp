@@ -234,6 +234,15 @@ void Schedule::AddShowEvent(ShowEventPtr event) {
         }
     }
 
+    // The event inside the gap: the wait before it, the event, and a new wait after it.
+    auto splitGap = [&] {
+        auto wait = NewWait(newEnd, gapEvent.EndTime());
+        gapEvent.SetEndTime(newStart);
+        Touch(gap);
+        Node* added = InsertAfter(gap, std::move(event));
+        InsertAfter(added, std::move(wait));
+    };
+
     if (list_->Count() == 1) {
         // One wait covering the whole week.
         if (gapEvent.StartTime()->BetweenEquals(*newStart, *newEnd)) {
@@ -242,11 +251,7 @@ void Schedule::AddShowEvent(ShowEventPtr event) {
             Touch(gap);
             InsertAfter(gap, std::move(event));
         } else {
-            auto wait = NewWait(newEnd, gapEvent.EndTime());
-            gapEvent.SetEndTime(newStart);
-            Touch(gap);
-            Node* added = InsertAfter(gap, std::move(event));
-            InsertAfter(added, std::move(wait));
+            splitGap();
         }
         return;
     }
@@ -265,11 +270,7 @@ void Schedule::AddShowEvent(ShowEventPtr event) {
         Touch(gap);
         InsertAfter(gap, std::move(event));
     } else {
-        auto wait = NewWait(newEnd, gapEvent.EndTime());
-        gapEvent.SetEndTime(newStart);
-        Touch(gap);
-        Node* added = InsertAfter(gap, std::move(event));
-        InsertAfter(added, std::move(wait));
+        splitGap();
     }
 }
 
