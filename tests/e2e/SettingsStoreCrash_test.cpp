@@ -75,10 +75,6 @@ std::optional<int64_t> GenerationOf(char writer, const std::string& value) {
 
 enum class Encoding { Utf8, Utf16 };
 
-void PrintTo(Encoding encoding, std::ostream* out) {
-    *out << (encoding == Encoding::Utf8 ? "UTF-8" : "UTF-16LE");
-}
-
 // The store with the payloads at generations a and b, in the file's encoding: other keys, a
 // foreign root, comments, continued lines and value types the program never changes, and the
 // two payloads, each on the line that a write replaces.
@@ -107,11 +103,6 @@ std::string StoreBytes(Encoding encoding, int64_t a, int64_t b) {
     return bytes;
 }
 
-std::string ReadAllBytes(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-}
-
 // What one read of the whole file shows: the two generations when the bytes are exactly a
 // version of the store, else nothing.
 std::optional<std::pair<int64_t, int64_t>> VersionOf(Encoding encoding, const std::string& bytes) {
@@ -137,6 +128,15 @@ std::optional<std::pair<int64_t, int64_t>> VersionOf(Encoding encoding, const st
 }
 
 #ifndef _WIN32
+
+void PrintTo(Encoding encoding, std::ostream* out) {
+    *out << (encoding == Encoding::Utf8 ? "UTF-8" : "UTF-16LE");
+}
+
+std::string ReadAllBytes(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
 
 // A child process of the test; it never returns into the test program.
 template <typename Body>

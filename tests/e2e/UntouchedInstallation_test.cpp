@@ -51,11 +51,13 @@ struct Snapshot {
 
 Snapshot Take(const std::string& root, const std::string& except) {
     Snapshot snapshot;
+    // Compared as normal paths: on Windows the store's name may mix both separators.
+    const fs::path skipped = fs::path(except).lexically_normal();
     for (const auto& entry : fs::recursive_directory_iterator(root)) {
         const std::string path = entry.path().string();
         if (entry.is_directory()) {
             snapshot.folders.insert(path);
-        } else if (path != except) {
+        } else if (entry.path().lexically_normal() != skipped) {
             snapshot.files[path] = {testsupport::ReadFileBytes(path), entry.last_write_time()};
         }
     }
@@ -280,10 +282,12 @@ class UntouchedInstallation : public testsupport::StoreTest {
         // take new files (read-only; or, for a user whom permissions do not stop, a path
         // below a plain file).
         std::string tempFolder = TempDir();
-        std::optional<testsupport::ScopedEnvironment> noTemp;
+        // Windows takes its temporary folder from TMP.
+        std::optional<testsupport::ScopedEnvironment> noTemp, noWindowsTemp;
         if (mode == Mode::NoTempFolder) {
             tempFolder = UnwritableFolder();
             noTemp.emplace("TMPDIR", tempFolder);
+            noWindowsTemp.emplace("TMP", tempFolder);
         }
 
         IgnoringUser user;
@@ -360,7 +364,9 @@ class UntouchedInstallation : public testsupport::StoreTest {
     // that the installation's own store sees only the runs under test.
     int ChecksOfWholeRun(Target target) {
         const std::string copy = folder_.File("store-copy.reg");
-        fs::copy_file(storeFile_, copy, fs::copy_options::overwrite_existing);
+        // Removed first: the Windows build's library refuses to overwrite even when asked to.
+        fs::remove(copy);
+        fs::copy_file(storeFile_, copy);
         testsupport::ScopedStore store(copy);
         std::string failure;
         EXPECT_TRUE(Select(target, failure)) << failure;
