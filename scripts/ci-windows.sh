@@ -51,7 +51,10 @@ if grep -q "warning:" "$build/build.log"; then
 fi
 
 step "tests under Wine"
-ctest --test-dir "$build" --output-on-failure -j "$jobs" --timeout 300
+# A test that hangs under Wine is stopped after two minutes (the slowest take about 16 s)
+# and run once more: in one run, a test that creates the media player control while other
+# test processes worked never returned. A test that fails twice fails the job.
+ctest --test-dir "$build" --output-on-failure -j "$jobs" --timeout 120 --repeat until-pass:2
 
 step "the demo installation under Wine"
 demo=$build/demo
