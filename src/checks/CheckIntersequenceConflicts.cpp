@@ -73,7 +73,9 @@ struct SectionRecord {
     int32_t mask = 0;
     // Every registration in the order made; per key, the first and the last of its chain.
     std::vector<Registration> registrations;
-    std::unordered_map<std::string, std::pair<int32_t, int32_t>> channels;
+    std::unordered_map<seqlib::Channel::SettingsId, std::pair<int32_t, int32_t>,
+                       seqlib::Channel::SettingsIdHash>
+        channels;
     std::vector<BlobberConflictHelper::Blobber> blobbers;
 };
 
@@ -154,7 +156,7 @@ class IntersequenceWalk {
         // A channel shared by several tracks of one sequence counts once, with its first.
         if (inEarlierTracks.count(&channel) != 0)
             return;
-        const std::string key = channel.SettingsKey();
+        const seqlib::Channel::SettingsId key = channel.SettingsIdentity();
         const ChannelRecord channelRecord{section.flag, sequence, track};
         for (const int32_t flag : kFlagOrder) {
             if ((section.mask & flag) == 0)

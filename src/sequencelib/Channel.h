@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
@@ -48,6 +49,21 @@ class Channel {
     // absent part left empty ("1:0:10:1", "7:3::5", "3::37:"). "" without physical
     // settings.
     std::string SettingsKey() const;
+
+    // The same address as numbers, for the checks that look channels up by it many times:
+    // equal exactly when SettingsKey() is (a part the type does not have is 0, and the type
+    // alone decides which parts it has).
+    struct SettingsId {
+        int32_t type = 0;
+        int32_t network = 0;
+        int32_t unit = 0;
+        int32_t circuit = 0;
+        bool operator==(const SettingsId&) const = default;
+    };
+    struct SettingsIdHash {
+        std::size_t operator()(const SettingsId& id) const noexcept;
+    };
+    SettingsId SettingsIdentity() const;
 
     // True when the channel is on at some time between 0 and its sequence's length.
     bool IsEverOn() const { return everOn_; }

@@ -98,6 +98,34 @@ TEST(SequenceLoad, ReadsEverythingTheChecksAskAbout) {
     EXPECT_EQ(s.NovaluxFile(), nullptr);
 }
 
+// The numeric identity that the conflict checks look channels up by names the same
+// addresses as the settings key, for every device type: the parts a type does not have
+// never tell two channels apart, and the parts it has always do.
+TEST(SequenceLoad, ASettingsIdentityIsEqualExactlyWhenTheSettingsKeyIs) {
+    std::vector<Channel> channels;
+    for (int32_t type = 0; type <= 9; ++type) {
+        for (const int32_t network : {0, 3, 15}) {
+            for (const uint8_t unit : {uint8_t{0}, uint8_t{1}, uint8_t{240}}) {
+                for (const int16_t circuit : {int16_t{0}, int16_t{1}, int16_t{512}}) {
+                    Channel& channel = channels.emplace_back();
+                    channel.SetDevice(DeviceAddress(type, network, unit, circuit, 1));
+                }
+            }
+        }
+    }
+    const Channel::SettingsIdHash hash;
+    for (const Channel& a : channels) {
+        for (const Channel& b : channels) {
+            const bool sameKey = a.SettingsKey() == b.SettingsKey();
+            ASSERT_EQ(a.SettingsIdentity() == b.SettingsIdentity(), sameKey)
+                << a.SettingsKey() << " / " << b.SettingsKey();
+            if (sameKey) {
+                ASSERT_EQ(hash(a.SettingsIdentity()), hash(b.SettingsIdentity()));
+            }
+        }
+    }
+}
+
 TEST(SequenceLoad, TracksShareOneObjectPerChannelIdWhereverItIsDefined) {
     TempFolder folder;
     // The tracks come first here, so their references wait for the channels.
