@@ -194,16 +194,6 @@ std::optional<std::string> ReadQuoted(std::string_view s, std::size_t& pos) {
     return std::nullopt;
 }
 
-std::string Quote(std::string_view text) {
-    std::string out = "\"";
-    for (char c : text) {
-        if (c == '\\' || c == '"')
-            out += '\\';
-        out += c;
-    }
-    return out + "\"";
-}
-
 // Follows the quotes of one more piece of a value line (quoted tells whether the piece starts
 // inside a quoted text, and is left telling whether it ends inside one) and says whether the
 // piece ends with a backslash outside quotes: the value goes on on the next line.
@@ -644,14 +634,12 @@ std::string Document::Newline() const {
 }
 
 std::string Document::RenderValueLine(const std::string& name, const Value& value) const {
-    const std::string left = name.empty() ? "@=" : Quote(name) + "=";
+    const std::string left = name.empty() ? "@=" : QuotedText(name) + "=";
     if (value.type == RegistryStore::ValueType::Dword && value.data.size() == 4) {
         uint32_t number = 0;
         for (int i = 3; i >= 0; --i)
             number = number << 8 | static_cast<unsigned char>(value.data[i]);
-        char digits[16];
-        std::snprintf(digits, sizeof digits, "dword:%08x", number);
-        return left + digits;
+        return left + DwordText(number);
     }
     // A string: quoted when it can stand on one line with its single terminator, else as the
     // bytes of the stored string.
@@ -659,7 +647,7 @@ std::string Document::RenderValueLine(const std::string& name, const Value& valu
     const bool quotable = !data.empty() && data.back() == '\0' &&
                           data.find_first_of(std::string("\r\n\0", 3)) == data.size() - 1;
     if (quotable)
-        return left + Quote(std::string_view(data).substr(0, data.size() - 1));
+        return left + QuotedText(std::string_view(data).substr(0, data.size() - 1));
     std::string bytes = data;
     if (unicode_)
         bytes = TextToUtf16Le(data).value_or(std::string());
@@ -877,6 +865,22 @@ std::optional<std::string> Document::Serialize() const {
     if (!bytes)
         return std::nullopt;
     return (byteOrderMark_ ? std::string("\xFF\xFE") : std::string()) + *bytes;
+}
+
+std::string QuotedText(std::string_view text) {
+    std::string out = "\"";
+    for (const char c : text) {
+        if (c == '\\' || c == '"')
+            out += '\\';
+        out += c;
+    }
+    return out + "\"";
+}
+
+std::string DwordText(uint32_t value) {
+    char digits[16];
+    std::snprintf(digits, sizeof digits, "dword:%08x", value);
+    return digits;
 }
 
 }  // namespace vtr::RegistryFile

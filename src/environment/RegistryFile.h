@@ -68,6 +68,11 @@ struct Key {
 // Names compare without regard to letter case; this is the form they are compared in.
 std::string Fold(std::string_view name);
 
+// A value as the file writes it: a string quoted with "\" and """ escaped, and a dword as
+// "dword:" and eight hex digits.
+std::string QuotedText(std::string_view text);
+std::string DwordText(uint32_t value);
+
 // Splits "A\B\C" into its names (empty names are dropped).
 KeyPath SplitKeyPath(std::string_view path);
 

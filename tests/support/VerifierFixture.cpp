@@ -1,11 +1,11 @@
 #include "support/VerifierFixture.h"
 
-#include <cstdio>
 #include <filesystem>
 
 #include "checks/CheckAppFileExists.h"
 #include "checks/CheckAppPathExists.h"
 #include "engine/LibVerify.h"
+#include "environment/RegistryFile.h"
 #include "support/PeImage.h"
 
 namespace vtr::testsupport {
@@ -85,19 +85,11 @@ std::vector<std::string> ResultTexts() {
 }
 
 std::string RegText(const std::string& text) {
-    std::string quoted = "\"";
-    for (char c : text) {
-        if (c == '\\' || c == '"')
-            quoted += '\\';
-        quoted += c;
-    }
-    return quoted + "\"";
+    return RegistryFile::QuotedText(text);
 }
 
 std::string RegDword(uint32_t value) {
-    char digits[9];
-    std::snprintf(digits, sizeof digits, "%08x", value);
-    return std::string("dword:") + digits;
+    return RegistryFile::DwordText(value);
 }
 
 std::string StoreText(const StoreSections& sections) {

@@ -1,7 +1,6 @@
 #include "vtrgen/InstallationGenerator.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <filesystem>
 #include <memory>
 #include <set>
@@ -9,6 +8,7 @@
 #include "checks/CheckAppFileExists.h"
 #include "checks/CheckAppPathExists.h"
 #include "engine/VtrError.h"
+#include "environment/RegistryFile.h"
 #include "schedule/Schedule.h"
 #include "schedule/WeekTime.h"
 #include "schedule/YearSchedule.h"
@@ -42,23 +42,6 @@ void WriteText(const std::string& path, const std::string& text) {
     if (error != 0)
         Raise(ErrorNumbers::UserMessage, kSource,
               "Cannot write \"" + path + "\": " + FileErrorDescription(error));
-}
-
-// A value of the settings store text: a quoted string with "\" and """ escaped.
-std::string Quoted(const std::string& text) {
-    std::string quoted = "\"";
-    for (const char c : text) {
-        if (c == '\\' || c == '"')
-            quoted += '\\';
-        quoted += c;
-    }
-    return quoted + '"';
-}
-
-std::string Dword(uint32_t value) {
-    char digits[9];
-    std::snprintf(digits, sizeof digits, "%08x", value);
-    return std::string("dword:") + digits;
 }
 
 WeekTimePtr WeekTimeAt(int32_t seconds) {
@@ -354,21 +337,24 @@ std::string SettingsStoreText(const Installation& installation,
     const std::string root = "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared";
     std::string text = "Windows Registry Editor Version 5.00\r\n\r\n";
     text += root + "]\r\n";
-    text += "\"AppPath\"=" + Quoted(installation.appFolder) + "\r\n";
-    text += "\"UserDataPath\"=" + Quoted(installation.userDataFolder) + "\r\n";
-    text += "\"NonMediaDataPath\"=" + Quoted(installation.nonMediaFolder) + "\r\n";
-    text += "\"MediaDataPath\"=" + Quoted(installation.mediaFolder) + "\r\n";
-    text += "\"PostInstall\"=" + Dword(1) + "\r\n";
-    text += "\"PostInstallVer\"=" + Dword(53) + "\r\n";
-    text += "\"UseCompressedSequences\"=" + Dword(1) + "\r\n\r\n";
-    text += root + "\\MonitorMemory]\r\n\"MonitorRestart\"=" + Dword(1) + "\r\n\r\n";
+    text += "\"AppPath\"=" + RegistryFile::QuotedText(installation.appFolder) + "\r\n";
+    text += "\"UserDataPath\"=" + RegistryFile::QuotedText(installation.userDataFolder) + "\r\n";
+    text +=
+        "\"NonMediaDataPath\"=" + RegistryFile::QuotedText(installation.nonMediaFolder) + "\r\n";
+    text += "\"MediaDataPath\"=" + RegistryFile::QuotedText(installation.mediaFolder) + "\r\n";
+    text += "\"PostInstall\"=" + RegistryFile::DwordText(1) + "\r\n";
+    text += "\"PostInstallVer\"=" + RegistryFile::DwordText(53) + "\r\n";
+    text += "\"UseCompressedSequences\"=" + RegistryFile::DwordText(1) + "\r\n\r\n";
+    text +=
+        root + "\\MonitorMemory]\r\n\"MonitorRestart\"=" + RegistryFile::DwordText(1) + "\r\n\r\n";
     text += root + "\\MediaPlayer]\r\n\"VersionInfo\"=\"12.0.19041.1\"\r\n\r\n";
     text += root + "\\NetVersion]\r\n\"Ver\"=\"1\"\r\n\r\n";
     const std::string networks = root + "\\Network1";
-    text += networks + "]\r\n\"NetworkVantori\"=" + Dword(1) + "\r\n\r\n";
+    text += networks + "]\r\n\"NetworkVantori\"=" + RegistryFile::DwordText(1) + "\r\n\r\n";
     for (int32_t n = 1; n < 16; ++n) {
         text += networks + "\\Aux" + static_cast<char>('A' + n - 1) +
-                "]\r\n\"NetworkVantori\"=" + Dword(static_cast<uint32_t>(n + 1)) + "\r\n\r\n";
+                "]\r\n\"NetworkVantori\"=" + RegistryFile::DwordText(static_cast<uint32_t>(n + 1)) +
+                "\r\n\r\n";
     }
     for (const int32_t universe : dmxUniverses) {
         text += networks + "\\DMX" + std::to_string(universe) + "]\r\n\"Adapter\"=\"USB DMX " +
