@@ -65,6 +65,9 @@ const QString kTargetShowKey = QStringLiteral("target/show");
 
 constexpr int kDetailColumns = 9;
 
+// The progress bar's text while a run goes and after it completed.
+const QString kProgressFormat = QStringLiteral("%v of %m checks");
+
 // A list item: the result it shows (its tag) and the order in which results were listed,
 // so that a result moved between the lists lands where it was produced.
 class ResultItem : public QTreeWidgetItem {
@@ -110,6 +113,18 @@ TargetKind KindOfFile(const QString& path) {
     if (suffix == QLatin1String("las") || suffix == QLatin1String("lms"))
         return TargetKind::Sequence;
     return TargetKind::None;
+}
+
+// A target file as the window verifies and remembers it: absolute, relative names taken from
+// the working folder, "." and ".." resolved, in the system's own notation. The results name
+// the file this way, and so does the key that ignores one of them, wherever the window is
+// opened next. Empty stays empty.
+QString AbsoluteTarget(const QString& path) {
+    const QString trimmed = path.trimmed();
+    if (trimmed.isEmpty())
+        return trimmed;
+    return QDir::toNativeSeparators(
+        QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
 }
 
 QString ErrorText(const std::exception& error) {
@@ -298,11 +313,8 @@ void frmVerifier::BuildControls() {
     rtxOutputLog_->setUndoRedoEnabled(false);
     rtxOutputLog_->setTextInteractionFlags(Qt::TextSelectableByMouse |
                                            Qt::TextSelectableByKeyboard);
-    // The severity colours are chosen for a light page, whatever the desktop's theme.
-    QPalette logPalette = rtxOutputLog_->palette();
-    logPalette.setColor(QPalette::Base, Qt::white);
-    logPalette.setColor(QPalette::Text, Qt::black);
-    rtxOutputLog_->setPalette(logPalette);
+    // The lines' colours follow the palette: chosen again whenever it changes.
+    rtxOutputLog_->installEventFilter(this);
     imlSeverity_ = new SeverityImageList(this);
     lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"));
     lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"));
@@ -370,7 +382,7 @@ void frmVerifier::BuildControls() {
     prgVerification_->setObjectName(QStringLiteral("prgVerification"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
-    prgVerification_->setFormat(QStringLiteral("%v of %m checks"));
+    prgVerification_->setFormat(kProgressFormat);
     prgVerification_->setAccessibleName(QStringLiteral("Verification progress"));
     lblStatus_ = new QLabel(frameSummary_);
     lblStatus_->setObjectName(QStringLiteral("lblStatus"));
@@ -488,8 +500,8 @@ void frmVerifier::LoadPlacement() {
     const QByteArray geometry = settings.value(kGeometryKey).toByteArray();
     if (!geometry.isEmpty())
         restoreGeometry(geometry);
-    txtTargetSequence_->setText(settings.value(kTargetSequenceKey).toString());
-    txtTargetShow_->setText(settings.value(kTargetShowKey).toString());
+    txtTargetSequence_->setText(AbsoluteTarget(settings.value(kTargetSequenceKey).toString()));
+    txtTargetShow_->setText(AbsoluteTarget(settings.value(kTargetShowKey).toString()));
     const QString kind = settings.value(kTargetKindKey).toString();
     if (kind == QLatin1String("sequence")) {
         optTargetSequence_->setChecked(true);
@@ -503,8 +515,8 @@ void frmVerifier::LoadPlacement() {
 void frmVerifier::SavePlacement() const {
     QSettings settings(settingsFile_, QSettings::IniFormat);
     settings.setValue(kGeometryKey, saveGeometry());
-    settings.setValue(kTargetSequenceKey, txtTargetSequence_->text());
-    settings.setValue(kTargetShowKey, txtTargetShow_->text());
+    settings.setValue(kTargetSequenceKey, AbsoluteTarget(txtTargetSequence_->text()));
+    settings.setValue(kTargetShowKey, AbsoluteTarget(txtTargetShow_->text()));
     settings.setValue(kTargetKindKey, optTargetSequence_->isChecked() ? QStringLiteral("sequence")
                                       : optTargetShow_->isChecked()   ? QStringLiteral("show")
                                                                       : QStringLiteral("schedule"));
@@ -550,9 +562,10 @@ void frmVerifier::dropEvent(QDropEvent* event) {
         event->acceptProposedAction();
 }
 
-bool frmVerifier::SetTargetFile(const QString& path) {
+bool frmVerifier::SetTargetFile(const QString& file) {
     if (running_)
         return false;
+    const QString path = AbsoluteTarget(file);
     switch (KindOfFile(path)) {
         case TargetKind::Sequence:
             txtTargetSequence_->setText(path);
@@ -591,6 +604,8 @@ void frmVerifier::ResetSummary() {
         count->setText(QStringLiteral("0"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
+    runCancelled_ = false;
+    checksDropped_ = 0;
 }
 
 void frmVerifier::SummaryChanged() {
@@ -613,11 +628,15 @@ void frmVerifier::RefreshSummary() {
     const int32_t remaining = LibVerify::ChecksRemainingCount();
     lblChecksPerformedCount_->setText(QString::number(performed));
     lblChecksRemainingCount_->setText(QString::number(remaining));
-    lblErrorsCount_->setText(QString::number(LibVerify::ErrorCount()));
-    lblWarningsCount_->setText(QString::number(LibVerify::WarningCount()));
-    const int total = std::max(1, performed + remaining);
+    // The errors and warnings the Results list shows: the driver's counts until the user
+    // ignores or stops ignoring a result, the list's own from then on.
+    lblErrorsCount_->setText(QString::number(errorsListed_));
+    lblWarningsCount_->setText(QString::number(warningsListed_));
+    // A cancelled run stops short of the checks it dropped, and says so.
+    const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
     prgVerification_->setValue(std::min(performed, total));
+    prgVerification_->setFormat(runCancelled_ ? QStringLiteral("Cancelled") : kProgressFormat);
 }
 
 // --- The output log ------------------------------------------------------------------------
@@ -628,15 +647,39 @@ QColor ToQColor(const OutputLog::Colour& colour) {
     return QColor(colour.red, colour.green, colour.blue);
 }
 
-}  // namespace
+// Each line of the log carries what its colour stands for, so that it can be coloured again
+// when the palette changes: a severity's number, or kPlainLine.
+constexpr int kLogLineKind = QTextFormat::UserProperty + 1;
+constexpr int kPlainLine = -1;
 
-QColor frmVerifier::SeverityColour(Severity severity) {
-    return ToQColor(OutputLog::ResultColour(severity));
+bool IsDarkPage(const QPalette& palette) {
+    return palette.color(QPalette::Base).lightness() < 128;
 }
 
-void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
+}  // namespace
+
+QColor frmVerifier::LogColour(int kind, const QPalette& palette) {
+    const bool dark = IsDarkPage(palette);
+    if (kind == kPlainLine)
+        return dark ? palette.color(QPalette::Text) : ToQColor(OutputLog::kBlack);
+    const auto severity = static_cast<Severity>(kind);
+    if (!dark)
+        return ToQColor(OutputLog::ResultColour(severity));
+    // On a dark page the same hues, lighter, so that they stand out as well as on a light one.
+    switch (severity) {
+        case Severity::Info:
+            return QColor(110, 160, 255);
+        case Severity::Warning:
+            return QColor(255, 170, 70);
+        case Severity::Error:
+            return QColor(255, 110, 110);
+    }
+    return palette.color(QPalette::Text);
+}
+
+void frmVerifier::WriteLog(const QString& text, int kind) {
     // The time stamp is taken now, whenever the line reaches the screen.
-    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), colour});
+    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), kind});
     if (!running_)
         FlushLog();
 }
@@ -644,12 +687,14 @@ void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
 void frmVerifier::FlushLog() {
     if (pendingLog_.isEmpty())
         return;
+    const QPalette palette = rtxOutputLog_->palette();
     QTextCursor cursor(rtxOutputLog_->document());
     cursor.movePosition(QTextCursor::End);
     cursor.beginEditBlock();
     for (const LogLine& line : std::as_const(pendingLog_)) {
         QTextCharFormat format;
-        format.setForeground(line.colour);
+        format.setForeground(LogColour(line.kind, palette));
+        format.setProperty(kLogLineKind, line.kind);
         // Every line ends with a line break, so the document ends with an empty block.
         cursor.insertText(line.text + QLatin1Char('\n'), format);
     }
@@ -660,10 +705,36 @@ void frmVerifier::FlushLog() {
     scrollBar->setValue(scrollBar->maximum());
 }
 
+void frmVerifier::RecolourLog() {
+    const QPalette palette = rtxOutputLog_->palette();
+    QTextDocument* document = rtxOutputLog_->document();
+    QTextCursor cursor(document);
+    cursor.beginEditBlock();
+    for (QTextBlock block = document->begin(); block.isValid(); block = block.next()) {
+        for (auto fragment = block.begin(); !fragment.atEnd(); ++fragment) {
+            const QTextFragment piece = fragment.fragment();
+            QTextCharFormat format = piece.charFormat();
+            if (!format.hasProperty(kLogLineKind))
+                continue;
+            format.setForeground(LogColour(format.intProperty(kLogLineKind), palette));
+            cursor.setPosition(piece.position());
+            cursor.setPosition(piece.position() + piece.length(), QTextCursor::KeepAnchor);
+            cursor.setCharFormat(format);
+        }
+    }
+    cursor.endEditBlock();
+}
+
+bool frmVerifier::eventFilter(QObject* watched, QEvent* event) {
+    if (watched == rtxOutputLog_ && event->type() == QEvent::PaletteChange)
+        RecolourLog();
+    return QMainWindow::eventFilter(watched, event);
+}
+
 // --- Notification handlers -----------------------------------------------------------------
 
 void frmVerifier::CheckAdded(ICheck& check) {
-    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), ToQColor(OutputLog::kBlack));
+    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), kPlainLine);
     SummaryChanged();
 }
 
@@ -673,13 +744,17 @@ void frmVerifier::CheckCompleted(ICheck&) {
 
 void frmVerifier::Checking(ICheck& check) {
     const QString text = FromSuiteText(OutputLog::CheckingText(check));
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
 void frmVerifier::ChecksCompleted(bool cancelled) {
-    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), ToQColor(OutputLog::kBlack));
-    SetStatus(QString());
+    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), kPlainLine);
+    runCancelled_ = cancelled;
+    SetStatus(cancelled ? QStringLiteral("Cancelled: %1 of %2 checks performed")
+                              .arg(LibVerify::ChecksPerformedCount())
+                              .arg(LibVerify::ChecksPerformedCount() + checksDropped_)
+                        : QString());
     SetRunning(false);
     RefreshSummary();
     sstDetails_->setCurrentIndex(ResultsTab);
@@ -692,6 +767,8 @@ void frmVerifier::Initializing() {
     lvResults_[1]->clear();
     popupResult_.reset();
     resultsListed_ = 0;
+    errorsListed_ = 0;
+    warningsListed_ = 0;
     SetStatus(QString());
     sstDetails_->setCurrentIndex(OutputLogTab);
 }
@@ -700,13 +777,13 @@ void frmVerifier::ResultAdded(const ResultPtr& result) {
     QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
     AddResultItem(list, result, resultsListed_++);
     SummaryChanged();
-    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), SeverityColour(result->Severity()));
+    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), static_cast<int>(result->Severity()));
     LibVerify::ProcessPendingEvents();
 }
 
 void frmVerifier::TransientMessage(const std::string& message) {
     const QString text = FromSuiteText(message);
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
@@ -741,6 +818,16 @@ void frmVerifier::AddResultItem(QTreeWidget* list, const ResultPtr& result, qint
         tip += QLatin1Char('\n') + details.join(QLatin1Char('\n'));
     item->setToolTip(DescriptionColumn, tip);
     list->addTopLevelItem(item);
+    if (list == lvResults_[0])
+        CountListed(*result, 1);
+}
+
+void frmVerifier::CountListed(const Result& result, int change) {
+    if (result.Severity() == Severity::Error) {
+        errorsListed_ += change;
+    } else if (result.Severity() == Severity::Warning) {
+        warningsListed_ += change;
+    }
 }
 
 void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item) {
@@ -761,6 +848,7 @@ void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* 
         }
     }
     to->insertTopLevelItem(index, resultItem);
+    CountListed(*resultItem->Result(), to == lvResults_[0] ? 1 : -1);
 }
 
 void frmVerifier::RefreshIgnoredResults() {
@@ -782,6 +870,8 @@ void frmVerifier::RefreshIgnoredResults() {
         MoveItem(results, ignored, item);
     for (QTreeWidgetItem* item : toResults)
         MoveItem(ignored, results, item);
+    if (!toIgnored.isEmpty() || !toResults.isEmpty())
+        SummaryChanged();
 }
 
 ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
@@ -792,20 +882,21 @@ ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
 }
 
 void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
-    QTreeWidgetItem* item = list->itemAt(list->viewport()->mapFrom(list, position));
+    // The position comes in the viewport's coordinates, as the list's items are laid out.
+    QTreeWidgetItem* item = list->itemAt(position);
     QPoint at = position;
     if (item == nullptr) {
         // From the keyboard (the menu key): the current item.
         item = list->currentItem();
         if (item == nullptr)
             return;
-        at = list->viewport()->mapTo(list, list->visualItemRect(item).bottomLeft());
+        at = list->visualItemRect(item).bottomLeft();
     }
     list->setCurrentItem(item);
     popupResult_ = ResultOf(item);
     if (!popupResult_)
         return;
-    mnuResultPopup_->popup(list->mapToGlobal(at));
+    mnuResultPopup_->popup(list->viewport()->mapToGlobal(at));
 }
 
 // --- Commands ------------------------------------------------------------------------------
@@ -830,14 +921,16 @@ void frmVerifier::ShowError(const QString& title, const QString& text) {
 
 void frmVerifier::ApplyTarget() {
     if (optTargetShow_->isChecked()) {
-        const QString show = txtTargetShow_->text().trimmed();
+        const QString show = AbsoluteTarget(txtTargetShow_->text());
         if (show.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the show file to verify");
+        txtTargetShow_->setText(show);
         LibVerify::VerifyShowFile(ToSuiteText(show));
     } else if (optTargetSequence_->isChecked()) {
-        const QString sequence = txtTargetSequence_->text().trimmed();
+        const QString sequence = AbsoluteTarget(txtTargetSequence_->text());
         if (sequence.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the sequence file to verify");
+        txtTargetSequence_->setText(sequence);
         LibVerify::VerifySequenceFile(ToSuiteText(sequence));
     } else {
         LibVerify::SetScheduleFiles(VTRCommon::GetWeeklyScheduleFile(),
@@ -870,7 +963,12 @@ void frmVerifier::Verify() {
 }
 
 void frmVerifier::Cancel() {
-    Guarded(kVerifierError, [] { LibVerify::CancelVerification(); });
+    Guarded(kVerifierError, [this] {
+        // The queue is emptied: the progress bar keeps room for what it held.
+        if (running_ && !LibVerify::IsCancelled())
+            checksDropped_ = LibVerify::ChecksRemainingCount();
+        LibVerify::CancelVerification();
+    });
 }
 
 std::string frmVerifier::ChooseResultsReportFile() {
