@@ -2,6 +2,7 @@
 
 #include <QAction>
 #include <QApplication>
+#include <QClipboard>
 #include <QCloseEvent>
 #include <QCursor>
 #include <QDir>
@@ -23,6 +24,7 @@
 #include <QScrollBar>
 #include <QSettings>
 #include <QShortcut>
+#include <QSplitter>
 #include <QStyle>
 #include <QTabWidget>
 #include <QTextBlock>
@@ -32,6 +34,7 @@
 #include <algorithm>
 #include <exception>
 
+#include "ResultDetailsPane.h"
 #include "UiText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
@@ -56,6 +59,8 @@ const QString kErrorSavingMessages = QStringLiteral("Error Saving Verifier Messa
 const QString kHelpContextError = QStringLiteral("Help Context Error");
 const QString kHelpFileError = QStringLiteral("Help File Error");
 const QString kDoubleClickError = QStringLiteral("Details List Double Click Error");
+const QString kIgnoreListError = QStringLiteral("Ignore List Error");
+const QString kOpenFolderError = QStringLiteral("Error Opening Folder");
 
 // Settings of the window's own file.
 const QString kGeometryKey = QStringLiteral("window/geometry");
@@ -372,9 +377,24 @@ void frmVerifier::BuildControls() {
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(frameSummary_, 1);
     bottom->addLayout(buttons);
+    // The selected result whole, under the lists; the user sets the share of each.
+    fraResultDetails_ = new ResultDetailsPane(central);
+    auto* splitter = new QSplitter(Qt::Vertical, central);
+    splitter->setObjectName(QStringLiteral("splDetails"));
+    splitter->addWidget(sstDetails_);
+    splitter->addWidget(fraResultDetails_);
+    splitter->setStretchFactor(0, 3);
+    splitter->setStretchFactor(1, 1);
+    splitter->setSizes({400, fontMetrics().height() * 12});
+    splitter->setChildrenCollapsible(false);
+    connect(sstDetails_, &QTabWidget::currentChanged, this, [this] { ShowSelectedResult(); });
+    connect(fraResultDetails_, &ResultDetailsPane::HelpRequested, this, &frmVerifier::HelpOnResult);
+    connect(fraResultDetails_, &ResultDetailsPane::OpenFolderRequested, this,
+            &frmVerifier::OpenFolder);
+
     auto* layout = new QVBoxLayout(central);
     layout->addWidget(frameTarget_);
-    layout->addWidget(sstDetails_, 1);
+    layout->addWidget(splitter, 1);
     layout->addLayout(bottom);
 
     // Progress of a run and the passing status text, beside the counts.
@@ -392,7 +412,8 @@ void frmVerifier::BuildControls() {
     summaryLayout->addWidget(lblStatus_, 1, 4);
 
     setAcceptDrops(true);
-    resize(900, 640);
+    resize(1040, 740);
+    ShowSelectedResult();
 }
 
 QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
@@ -425,6 +446,9 @@ QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
             [this, list](const QPoint& position) { ShowResultPopup(list, position); });
     connect(list, &QTreeWidget::itemDoubleClicked, this,
             [this](QTreeWidgetItem* item) { OpenResult(ResultOf(item)); });
+    connect(list, &QTreeWidget::currentItemChanged, this, [this] { ShowSelectedResult(); });
+    auto* copy = new QShortcut(QKeySequence::Copy, list, nullptr, nullptr, Qt::WidgetShortcut);
+    connect(copy, &QShortcut::activated, this, [this, list] { CopyResult(SelectedResult(list)); });
     auto* open =
         new QShortcut(QKeySequence(Qt::Key_Return), list, nullptr, nullptr, Qt::WidgetShortcut);
     auto* openEnter =
@@ -432,17 +456,31 @@ QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
     for (QShortcut* shortcut : {open, openEnter})
         connect(shortcut, &QShortcut::activated, this,
                 [this, list] { OpenResult(SelectedResult(list)); });
+    // Delete ignores a result of the Results list, and stops ignoring one of the Ignored
+    // Results list; with Shift, all results with its message number.
+    const bool ignoredList = name == QLatin1String("lvResults2");
     auto* ignore = new QShortcut(QKeySequence::Delete, list, nullptr, nullptr, Qt::WidgetShortcut);
-    connect(ignore, &QShortcut::activated, this,
-            [this, list] { IgnoreResult(SelectedResult(list)); });
+    connect(ignore, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringResult(SelectedResult(list));
+        } else {
+            IgnoreResult(SelectedResult(list));
+        }
+    });
     auto* ignoreNumber = new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete), list, nullptr,
                                        nullptr, Qt::WidgetShortcut);
-    connect(ignoreNumber, &QShortcut::activated, this,
-            [this, list] { IgnoreMessageNumber(SelectedResult(list)); });
+    connect(ignoreNumber, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringMessageNumber(SelectedResult(list));
+        } else {
+            IgnoreMessageNumber(SelectedResult(list));
+        }
+    });
     return list;
 }
 
 void frmVerifier::BuildMenus() {
+    // The Results list's pop-up menu.
     mnuResultPopup_ = new QMenu(this);
     mnuResultPopup_->setObjectName(QStringLiteral("mnuResultPopup"));
     mnuHelpOnResult_ = mnuResultPopup_->addAction(QStringLiteral("Help on this result"));
@@ -460,6 +498,34 @@ void frmVerifier::BuildMenus() {
     connect(mnuIgnoreResult_, &QAction::triggered, this, [this] { IgnoreResult(popupResult_); });
     connect(mnuIgnoreMessageNumber_, &QAction::triggered, this,
             [this] { IgnoreMessageNumber(popupResult_); });
+
+    // The Ignored Results list's: the way back.
+    mnuIgnoredPopup_ = new QMenu(this);
+    mnuIgnoredPopup_->setObjectName(QStringLiteral("mnuIgnoredPopup"));
+    QAction* help = mnuIgnoredPopup_->addAction(QStringLiteral("Help on this result"));
+    help->setShortcut(QKeySequence(Qt::Key_F1));
+    mnuIgnoredPopup_->addSeparator();
+    mnuStopIgnoringResult_ =
+        mnuIgnoredPopup_->addAction(QStringLiteral("Stop ignoring this result"));
+    mnuStopIgnoringResult_->setObjectName(QStringLiteral("mnuStopIgnoringResult"));
+    mnuStopIgnoringResult_->setShortcut(QKeySequence::Delete);
+    mnuStopIgnoringMessageNumber_ = mnuIgnoredPopup_->addAction(
+        QStringLiteral("Stop ignoring all results with this message number"));
+    mnuStopIgnoringMessageNumber_->setObjectName(QStringLiteral("mnuStopIgnoringMessageNumber"));
+    mnuStopIgnoringMessageNumber_->setShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete));
+    connect(help, &QAction::triggered, this, [this] { HelpOnResult(popupResult_); });
+    connect(mnuStopIgnoringResult_, &QAction::triggered, this,
+            [this] { StopIgnoringResult(popupResult_); });
+    connect(mnuStopIgnoringMessageNumber_, &QAction::triggered, this,
+            [this] { StopIgnoringMessageNumber(popupResult_); });
+
+    // Both: the result as text.
+    for (QMenu* menu : {mnuResultPopup_, mnuIgnoredPopup_}) {
+        menu->addSeparator();
+        QAction* copy = menu->addAction(QStringLiteral("Copy"));
+        copy->setShortcut(QKeySequence::Copy);
+        connect(copy, &QAction::triggered, this, [this] { CopyResult(popupResult_); });
+    }
 
     // Keyboard access to the commands beyond the buttons' own letters.
     auto addShortcut = [this](const QKeySequence& keys, auto&& command) {
@@ -766,6 +832,7 @@ void frmVerifier::Initializing() {
     lvResults_[0]->clear();
     lvResults_[1]->clear();
     popupResult_.reset();
+    fraResultDetails_->ShowResult(nullptr);
     resultsListed_ = 0;
     errorsListed_ = 0;
     warningsListed_ = 0;
@@ -896,7 +963,17 @@ void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
     popupResult_ = ResultOf(item);
     if (!popupResult_)
         return;
-    mnuResultPopup_->popup(list->viewport()->mapToGlobal(at));
+    QMenu* menu = mnuResultPopup_;
+    if (list == lvResults_[1]) {
+        // An ignored result is listed for its own key, its message number, or both: each
+        // entry offers to take away what is there.
+        mnuStopIgnoringResult_->setEnabled(
+            IgnoreLists::IsIgnoreKeyIgnored(popupResult_->IgnoreKey()));
+        mnuStopIgnoringMessageNumber_->setEnabled(
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(popupResult_->MessageNumber())));
+        menu = mnuIgnoredPopup_;
+    }
+    menu->popup(list->viewport()->mapToGlobal(at));
 }
 
 // --- Commands ------------------------------------------------------------------------------
@@ -1031,21 +1108,68 @@ void frmVerifier::OpenResult(const ResultPtr& result) {
 }
 
 void frmVerifier::IgnoreResult(const ResultPtr& result) {
-    if (!result)
-        return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreResult(*result);
-        RefreshIgnoredResults();
-    });
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreResult(*result); });
 }
 
 void frmVerifier::IgnoreMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreMessageNumber(result->MessageNumber()); });
+}
+
+void frmVerifier::StopIgnoringResult(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreResult(*result); });
+}
+
+void frmVerifier::StopIgnoringMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreMessageNumber(result->MessageNumber()); });
+}
+
+template <typename Change>
+void frmVerifier::ChangeIgnoreLists(const ResultPtr& result, Change&& change) {
     if (!result)
         return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreMessageNumber(result->MessageNumber());
+    Guarded(kIgnoreListError, [&] {
+        change();
         RefreshIgnoredResults();
     });
+    // What the result is ignored by may have changed, whether or not it moved.
+    ShowSelectedResult();
+}
+
+void frmVerifier::CopyResult(const ResultPtr& result) {
+    if (result)
+        QApplication::clipboard()->setText(ResultDetailsPane::ResultText(*result));
+}
+
+void frmVerifier::OpenFolder(const QString& folder) {
+    if (!dialogs_->OpenFolder(this, folder))
+        ShowError(kOpenFolderError, QStringLiteral("Cannot open the folder %1").arg(folder));
+}
+
+void frmVerifier::ShowSelectedResult() {
+    const int tab = sstDetails_->currentIndex();
+    fraResultDetails_->setVisible(tab != OutputLogTab);
+    if (tab == OutputLogTab)
+        return;
+    const bool ignoredList = tab == IgnoredResultsTab;
+    const QTreeWidget* list = lvResults_[ignoredList ? 1 : 0];
+    const ResultPtr result = ResultOf(list->currentItem());
+    if (!result) {
+        fraResultDetails_->ShowResult(nullptr);
+        return;
+    }
+    QString ignoredBy;
+    if (ignoredList) {
+        const bool byKey = IgnoreLists::IsIgnoreKeyIgnored(result->IgnoreKey());
+        const bool byNumber =
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(result->MessageNumber()));
+        const QString number =
+            QStringLiteral("all results with message number %1").arg(result->MessageNumber());
+        ignoredBy = byKey && byNumber ? QStringLiteral("this result, and ") + number
+                    : byKey           ? QStringLiteral("this result")
+                                      : number;
+    }
+    fraResultDetails_->ShowResult(
+        result, imlSeverity_->Image(FromSuiteText(result->SeverityText())), ignoredBy);
 }
 
 void frmVerifier::ChooseTargetSequence() {

@@ -29,6 +29,8 @@ class QTreeWidgetItem;
 
 namespace vtr {
 
+class ResultDetailsPane;
+
 // The three severity images of the result lists, keyed "Info", "Warning" and "Error".
 class SeverityImageList : public QObject {
     Q_OBJECT
@@ -99,6 +101,15 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void HelpOnResult(const ResultPtr& result);
     void IgnoreResult(const ResultPtr& result);
     void IgnoreMessageNumber(const ResultPtr& result);
+    // The Ignored Results list's: take the result's key, or its message number, off the
+    // ignore lists (as the command line's unignore does); what is no longer ignored moves
+    // back to the Results list.
+    void StopIgnoringResult(const ResultPtr& result);
+    void StopIgnoringMessageNumber(const ResultPtr& result);
+    // Puts a result on the clipboard as text (the pop-up menus' "Copy", Ctrl+C).
+    void CopyResult(const ResultPtr& result);
+    // Shows a folder in the desktop's file manager ("Open containing folder").
+    void OpenFolder(const QString& folder);
     // A double-click (or Enter) on an item: help on its result.
     void OpenResult(const ResultPtr& result);
 
@@ -166,7 +177,13 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void CountListed(const Result& result, int change);
     void MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item);
     void ShowResultPopup(QTreeWidget* list, const QPoint& position);
+    // The details pane follows the selected result of the list shown.
+    void ShowSelectedResult();
     ResultPtr SelectedResult(const QTreeWidget* list) const;
+    // Changes the ignore lists for a result and moves the listed results accordingly; a
+    // failure is shown under "Ignore List Error".
+    template <typename Change>
+    void ChangeIgnoreLists(const ResultPtr& result, Change&& change);
     // Runs a command; a failure is shown in a message box with that title.
     template <typename Command>
     void Guarded(const QString& title, Command&& command);
@@ -190,6 +207,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QPlainTextEdit* rtxOutputLog_ = nullptr;
     QTreeWidget* lvResults_[2] = {nullptr, nullptr};
     SeverityImageList* imlSeverity_ = nullptr;
+    ResultDetailsPane* fraResultDetails_ = nullptr;
     // Summary.
     QGroupBox* frameSummary_ = nullptr;
     QLabel* lblChecksPerformedCount_ = nullptr;
@@ -207,6 +225,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QAction* mnuHelpOnResult_ = nullptr;
     QAction* mnuIgnoreResult_ = nullptr;
     QAction* mnuIgnoreMessageNumber_ = nullptr;
+    QMenu* mnuIgnoredPopup_ = nullptr;
+    QAction* mnuStopIgnoringResult_ = nullptr;
+    QAction* mnuStopIgnoringMessageNumber_ = nullptr;
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
     static constexpr qint64 kRepaintIntervalMs = 50;

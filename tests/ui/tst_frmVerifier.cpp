@@ -2,6 +2,7 @@
 // folder with its own settings store, window settings file, temporary folder and clock.
 #include <QAbstractButton>
 #include <QApplication>
+#include <QClipboard>
 #include <QGroupBox>
 #include <QHeaderView>
 #include <QLabel>
@@ -18,6 +19,7 @@
 #include <QSignalSpy>
 #include <QTabWidget>
 #include <QTextBlock>
+#include <QTextBrowser>
 #include <QTreeWidget>
 #include <QtTest>
 #include <filesystem>
@@ -58,6 +60,8 @@ class RecordingPresenter : public vtr::DialogPresenter {
     };
     QList<Box> boxes;
     QList<FileDialogRequest> requests;
+    QStringList foldersOpened;
+    bool folderOpens = true;
     std::function<std::optional<QString>(const FileDialogRequest&)> answer;
 
     void ShowError(QWidget*, const QString& title, const QString& text) override {
@@ -66,6 +70,10 @@ class RecordingPresenter : public vtr::DialogPresenter {
     std::optional<QString> ChooseFile(QWidget*, const FileDialogRequest& request) override {
         requests.append(request);
         return answer ? answer(request) : std::nullopt;
+    }
+    bool OpenFolder(QWidget*, const QString& folder) override {
+        foldersOpened.append(folder);
+        return folderOpens;
     }
 };
 
@@ -193,6 +201,8 @@ class FrmVerifierTest : public QObject {
     void aCancelledRunSaysSo();
     void versionAndHelpNeedNoDisplay();
     void logColoursSuitThePalette();
+    void stopIgnoringFromTheIgnoredList();
+    void detailsPaneShowsTheSelectedResultWhole();
 
   private:
     template <typename T>
@@ -362,12 +372,15 @@ void FrmVerifierTest::loadsWithEveryControlAndBegins() {
     QCOMPARE(Find<QPushButton>("cmdCancel")->text(), QStringLiteral("&Cancel"));
     QCOMPARE(Find<QPushButton>("cmdVerify")->text(), QStringLiteral("&Verify"));
 
+    // The pop-up menu's entries, the result's own first; then Copy.
     const QList<QAction*> popup = Find<QMenu>("mnuResultPopup")->actions();
-    QCOMPARE(popup.size(), 4);
+    QCOMPARE(popup.size(), 6);
     QCOMPARE(popup[0]->text(), QStringLiteral("Help on this result"));
     QVERIFY(popup[1]->isSeparator());
     QCOMPARE(popup[2]->text(), QStringLiteral("Ignore this result"));
     QCOMPARE(popup[3]->text(), QStringLiteral("Ignore all results with this message number"));
+    QVERIFY(popup[4]->isSeparator());
+    QCOMPARE(popup[5]->text(), QStringLiteral("Copy"));
     ExpectIdle();
 
     // Loaded: registered with the driver, and BeginVerification ran once, queueing the three
@@ -1155,6 +1168,215 @@ void FrmVerifierTest::logColoursSuitThePalette() {
     window_->setPalette(QPalette(QColor(240, 240, 240)));
     QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
     QCOMPARE(LogLineColour(4), QColor(0, 0, 255));
+}
+
+void FrmVerifierTest::stopIgnoringFromTheIgnoredList() {
+    const ResultPtr a = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr b = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    const ResultPtr c = LibVerify::AddResult(Severity::Error, "Six C", 6, 6, {"C"});
+    const ResultPtr d = LibVerify::AddResult(Severity::Warning, "Seven D", 7, 7, {"D"});
+    window_->IgnoreResult(b);
+    window_->IgnoreMessageNumber(c);
+    window_->IgnoreResult(d);
+    window_->IgnoreMessageNumber(d);  // D is ignored twice over
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTreeWidget* ignored = Ignored();
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B"), QStringLiteral("Six C"),
+                                              QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("0"));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("1"));
+
+    // The ignored list's menu offers the way back, for what each result is ignored by.
+    auto* menu = Find<QMenu>("mnuIgnoredPopup");
+    QStringList entries;
+    for (QAction* action : menu->actions())
+        entries.append(action->text());
+    QCOMPARE(entries, (QStringList{QStringLiteral("Help on this result"), QString(),
+                                   QStringLiteral("Stop ignoring this result"),
+                                   QStringLiteral("Stop ignoring all results with this message "
+                                                  "number"),
+                                   QString(), QStringLiteral("Copy")}));
+    auto* byKey = Find<QAction>("mnuStopIgnoringResult");
+    auto* byNumber = Find<QAction>("mnuStopIgnoringMessageNumber");
+    RightClick(ignored, ItemOf(ignored, c));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(!Find<QMenu>("mnuResultPopup")->isVisible());
+    QVERIFY(!byKey->isEnabled());
+    QVERIFY(byNumber->isEnabled());
+    menu->hide();
+    RightClick(ignored, ItemOf(ignored, d));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(byKey->isEnabled() && byNumber->isEnabled());
+    menu->hide();
+
+    // B, ignored on its own: back in its place at once, and the store changed exactly as the
+    // command line's unignore changes it.
+    const std::string storeFile = folder_->File("registry.reg");
+    const std::string cliStore = folder_->File("cli.reg");
+    fs::copy_file(storeFile, cliStore);
+    RightClick(ignored, ItemOf(ignored, b));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Stop ignoring this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("2"));
+    QProcess cli;
+    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
+              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
+               QStringLiteral("unignore"), QStringLiteral("--key"), QStringLiteral("5-B / ")});
+    QVERIFY(cli.waitForFinished(30000));
+    QCOMPARE(cli.exitCode(), 0);
+    QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
+    const std::string store = vtr::testsupport::ReadFileBytes(storeFile);
+    QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
+    QVERIFY(store.find("\"IgnoreMsg1\"=\"7-D / \"") != std::string::npos);
+
+    // C, ignored by its message number: the keyboard's Shift+Delete.
+    ignored->setFocus();
+    ignored->setCurrentItem(ItemOf(ignored, c));
+    QTest::keyClick(ignored, Qt::Key_Delete, Qt::ShiftModifier);
+    QCOMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                                                QStringLiteral("Six C")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("1"));
+    QVERIFY(vtr::testsupport::ReadFileBytes(storeFile).find(
+                "\"CountIgnoreMsgNum\"=dword:00000001") != std::string::npos);
+
+    // D, ignored twice over, stays ignored until both entries are gone.
+    window_->StopIgnoringResult(d);
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Seven D")}));
+    window_->StopIgnoringMessageNumber(d);
+    QVERIFY(ListTexts(ignored).isEmpty());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                          QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("3"));
+    QVERIFY(dialogs_->boxes.isEmpty());
+    Q_UNUSED(a);
+}
+
+// Where a link of a text browser is shown, in its viewport: the occurrence of its text whose
+// target is href.
+QPoint LinkPosition(QTextBrowser* browser, const QString& text, const QString& href) {
+    QTextCursor found(browser->document());
+    while (!(found = browser->document()->find(text, found)).isNull()) {
+        QTextCursor inside(browser->document());
+        inside.setPosition(found.selectionStart() + 2);
+        if (inside.charFormat().anchorHref() == href)
+            return browser->cursorRect(inside).center();
+    }
+    return {-1, -1};
+}
+
+void FrmVerifierTest::detailsPaneShowsTheSelectedResultWhole() {
+    fs::create_directories(DataFolder() + "/sequences");
+    vtr::testsupport::WriteFileBytes(DataFolder() + "/sequences/Glow.las", "");
+    const QString data = QDir::toNativeSeparators(QString::fromStdString(DataFolder()));
+    const QString sequences = data + QDir::separator() + QStringLiteral("sequences");
+    const std::string show = DataFolder() + "/Show0.lss";  // missing, in a folder that is there
+    const std::string glow = DataFolder() + "/sequences/Glow.las";
+    const std::string elsewhere = folder_->File("no such folder") + "/Gone.las";
+    const ResultPtr conflict =
+        LibVerify::AddResult(Severity::Warning, "Channel conflict", 43, 43,
+                             {"[SHOW]: " + show, "[SECTION]: Background", "[SEQUENCE]: " + glow,
+                              "[APPLICATION]: " + AppFolder(), "[FILE]: " + elsewhere});
+    const ResultPtr bare = LibVerify::AddResult(Severity::Error, "Bare", 3, 3);
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    auto* pane = Find<QFrame>("frameResultDetails");
+    // The log tab has no result to show.
+    QVERIFY(!pane->isVisible());
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QVERIFY(pane->isVisible());
+    QTRY_VERIFY(Find<QLabel>("lblResultHelp")->height() > 0);  // laid out
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Select a result to see it whole here."));
+    QVERIFY(!Find<QPushButton>("cmdCopyResult")->isEnabled());
+
+    // A click on a result shows it whole.
+    QTest::mouseClick(Results()->viewport(), Qt::LeftButton, {},
+                      OnItem(Results(), ItemOf(Results(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Channel conflict"));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(), QStringLiteral("Warning, message number 43"));
+    auto* details = Find<QTextBrowser>("txtResultDetails");
+    const QString link = QStringLiteral("Open containing folder");
+    const QString links = QStringLiteral("   ") + link;
+    QCOMPARE(details->toPlainText().split(QLatin1Char('\n')),
+             (QStringList{QString::fromStdString("[SHOW]: " + show) + links,
+                          QStringLiteral("[SECTION]: Background"),
+                          QString::fromStdString("[SEQUENCE]: " + glow) + links,
+                          QString::fromStdString("[APPLICATION]: " + AppFolder()) + links,
+                          QString::fromStdString("[FILE]: " + elsewhere)}));
+    QVERIFY(details->textInteractionFlags() & Qt::TextSelectableByMouse);
+
+    // "Open containing folder" beside the sequence: the folder that holds it; beside the
+    // application folder: that folder.
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:3")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:0")));
+    QCOMPARE(
+        dialogs_->foldersOpened,
+        (QStringList{sequences,
+                     QDir::toNativeSeparators(QDir::cleanPath(QString::fromStdString(AppFolder()))),
+                     data}));
+    // A folder the desktop cannot show: a message box says so.
+    dialogs_->folderOpens = false;
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QCOMPARE(
+        dialogs_->boxes,
+        (QList<RecordingPresenter::Box>{{QStringLiteral("Error Opening Folder"),
+                                         QStringLiteral("Cannot open the folder ") + sequences}}));
+    dialogs_->boxes.clear();
+
+    // Copy: the whole result as text, as the report has it.
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    const QString expected = QString::fromStdString(
+        "Message Number: 43\nSeverity: Warning\nDescription: Channel conflict\n"
+        "Detail #1: [SHOW]: " +
+        show +
+        "\nDetail #2: [SECTION]: Background\n"
+        "Detail #3: [SEQUENCE]: " +
+        glow + "\nDetail #4: [APPLICATION]: " + AppFolder() + "\nDetail #5: [FILE]: " + elsewhere +
+        "\n");
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+    // Ctrl+C in the list copies the selected result too.
+    QApplication::clipboard()->clear();
+    Results()->setFocus();
+    QTest::keyClick(Results(), Qt::Key_C, Qt::ControlModifier);
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+
+    // The help link: the result's topic (here the help file is missing, so its error).
+    auto* help = Find<QLabel>("lblResultHelp");
+    QTest::mouseClick(help, Qt::LeftButton, {}, QPoint(8, help->height() / 2));
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Help Context Error"));
+
+    // A result without details; then an ignored one says why it is ignored.
+    QTest::keyClick(Results(), Qt::Key_Down);
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Bare"));
+    QCOMPARE(details->toPlainText(), QStringLiteral("This result has no details."));
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    QCOMPARE(QApplication::clipboard()->text(),
+             QStringLiteral("Message Number: 3\nSeverity: Error\nDescription: Bare\n"));
+    window_->IgnoreMessageNumber(conflict);
+    window_->IgnoreResult(conflict);
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTest::mouseClick(Ignored()->viewport(), Qt::LeftButton, {},
+                      OnItem(Ignored(), ItemOf(Ignored(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: this result, and all results "
+                            "with message number 43)"));
+    window_->StopIgnoringResult(conflict);
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: all results with message "
+                            "number 43)"));
 }
 
 VTR_UI_TEST_MAIN(FrmVerifierTest)
