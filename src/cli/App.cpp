@@ -15,6 +15,7 @@
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
 #include "engine/VtrError.h"
+#include "environment/OutputFile.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
 
@@ -96,24 +97,19 @@ class ScopedEventPump {
     ScopedEventPump& operator=(const ScopedEventPump&) = delete;
 };
 
-bool SameFile(const std::string& a, const std::string& b) {
-    std::error_code error;
-    return !a.empty() && !b.empty() && fs::equivalent(fs::path(a), fs::path(b), error) && !error;
-}
+// The temporary files of the selected target go with the run, however it ends: normally,
+// cancelled, or by an error escaping (at the program's end the driver's state removes them
+// too, and a second Ctrl-C removes them in its handler).
+class TempFilesRemover {
+  public:
+    TempFilesRemover() = default;
+    ~TempFilesRemover() { LibVerify::DeleteTempFiles(); }
+    TempFilesRemover(const TempFilesRemover&) = delete;
+    TempFilesRemover& operator=(const TempFilesRemover&) = delete;
+};
 
-// What the run must not overwrite with its report: the target and the settings store.
-std::vector<std::string> ProtectedFiles(const Options& options) {
-    std::vector<std::string> files;
-    if (options.target == TargetKind::Schedule) {
-        files.push_back(VTRCommon::GetWeeklyScheduleFile());
-        files.push_back(VTRCommon::GetYearlyScheduleFile());
-    } else {
-        files.push_back(options.targetFile);
-    }
-    if (auto store = RegistryStore::CurrentFile())
-        files.push_back(*store);
-    return files;
-}
+constexpr const char* kReportWhat = "results file";
+constexpr const char* kReportSource = "vantori-verify --output";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -133,11 +129,6 @@ std::string SetUpProblem(const Options& options) {
         if (!fs::is_directory(folder, error))
             return "cannot write the results report " + *options.output +
                    ": its folder does not exist";
-        for (const std::string& file : ProtectedFiles(options)) {
-            if (SameFile(*options.output, file))
-                return "the results report " + *options.output +
-                       " would overwrite a file of the suite";
-        }
     }
     return {};
 }
@@ -193,13 +184,20 @@ int RunVerify(const Options& givenOptions, Console& console) {
     if (options.log)
         logging = std::make_unique<ScopedClient>(&logWriter);
 
-    // Ctrl-C from here on only asks for a cancellation, which the pump passes on between two
-    // steps of the run; the driver then removes its temporary files as at any other end.
+    // Ctrl-C (and SIGTERM, a hang-up, a closed output) from here on only asks for a
+    // cancellation, which the pump passes on as soon as it runs: between two checks, and
+    // inside long checks and sequence loads as they report progress. The driver then removes
+    // its temporary files as at any other end; a second Ctrl-C removes them and ends at once.
     auto interrupts = std::make_unique<InterruptGuard>();
     bool cancelRequested = false;
     ScopedEventPump pump([&] {
-        if (InterruptGuard::Requested() && !cancelRequested && LibVerify::IsVerifying()) {
+        const Interruption interruption = InterruptGuard::Requested();
+        if (interruption != Interruption::None && !cancelRequested && LibVerify::IsVerifying()) {
             cancelRequested = true;
+            if (progress)
+                progress->Erase();
+            Fail(console.err, CancellingNotice(interruption));
+            console.err.flush();
             LibVerify::CancelVerification();
         }
         if (progress) {
@@ -209,8 +207,12 @@ int RunVerify(const Options& givenOptions, Console& console) {
         }
     });
 
+    TempFilesRemover removeTempFiles;
     try {
         SelectTarget(options);
+        // The report would replace the target or the store: said before the run, not after.
+        if (options.output)
+            OutputFile::RefuseInput(*options.output, kReportWhat, kReportSource);
     } catch (const VtrError& error) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
@@ -229,12 +231,15 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.warnings = LibVerify::WarningCount();
     record.results = observer.TakeResults();
 
-    int status = ExitStatusOf(record);
+    // A cancelled run found less than there is: whatever it found, it is not a result.
+    int status = record.cancelled ? ExitStatus::Cancelled : ExitStatusOf(record);
     if (options.output) {
+        // Never over a file the run read or checked (the report writer refuses it), and
+        // whole or not at all.
         try {
             ResultsReport::SaveResultsReport(*options.output);
         } catch (const VtrError& error) {
-            Fail(console.err, "Error Saving Verifier Messages: " + error.Description());
+            Fail(console.err, error.Description());
             status = ExitStatus::CannotSetUp;
         }
     }
