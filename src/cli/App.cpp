@@ -3,20 +3,25 @@
 #include <exception>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <ostream>
 #include <string>
 #include <system_error>
 #include <vector>
 
+#include "Baseline.h"
 #include "IgnoreCommands.h"
 #include "Interrupt.h"
+#include "ReportFile.h"
 #include "ResultsOutput.h"
+#include "Terminal.h"
 #include "engine/LibVerify.h"
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
 #include "engine/VtrError.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
+#include "show/WholeFile.h"
 
 namespace vtr::cli {
 namespace {
@@ -175,6 +180,14 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, problem);
         return ExitStatus::CannotSetUp;
     }
+    std::optional<Baseline> baseline;
+    try {
+        if (options.baseline)
+            baseline = Baseline::Read(*options.baseline);
+    } catch (const VtrError& error) {
+        Fail(console.err, error.Description());
+        return ExitStatus::CannotSetUp;
+    }
 
     std::unique_ptr<ProgressLine> progress;
     if (console.errIsTerminal && !options.quiet)
@@ -225,16 +238,35 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.targetFile = options.targetFile;
     record.cancelled = observer.Cancelled() || LibVerify::IsCancelled();
     record.checksPerformed = LibVerify::ChecksPerformedCount();
-    record.errors = LibVerify::ErrorCount();
-    record.warnings = LibVerify::WarningCount();
     record.results = observer.TakeResults();
+    if (baseline)
+        baseline->Mark(record);
 
-    int status = ExitStatusOf(record);
+    Presentation presentation;
+    presentation.minimumSeverity = options.minimumSeverity;
+    presentation.groupBy = options.groupBy;
+    presentation.statistics = options.statistics;
+    presentation.failOn = options.failOn;
+    presentation.color = UseColor(options.color, console.outIsColorTerminal);
+    presentation.baselineFile = options.baseline;
+
+    int status = ExitStatusOf(record, options.failOn);
     if (options.output) {
         try {
-            ResultsReport::SaveResultsReport(*options.output);
+            SaveReport(*options.output, record, presentation);
         } catch (const VtrError& error) {
             Fail(console.err, "Error Saving Verifier Messages: " + error.Description());
+            status = ExitStatus::CannotSetUp;
+        }
+    }
+    if (options.writeBaseline && record.cancelled) {
+        Fail(console.err, "the baseline " + *options.writeBaseline +
+                              " was not written: the verification was cancelled");
+    } else if (options.writeBaseline) {
+        const int32_t failure = WriteWholeFile(*options.writeBaseline, Baseline::TextOf(record));
+        if (failure != 0) {
+            Fail(console.err, "cannot write the baseline " + *options.writeBaseline + ": " +
+                                  FileErrorDescription(failure));
             status = ExitStatus::CannotSetUp;
         }
     }
@@ -242,9 +274,9 @@ int RunVerify(const Options& givenOptions, Console& console) {
     interrupts.reset();
 
     if (options.format == OutputFormat::Json)
-        WriteJson(console.out, record);
+        WriteJson(console.out, record, presentation);
     else
-        WriteText(console.out, record);
+        WriteText(console.out, record, presentation);
     console.out.flush();
     return status;
 }

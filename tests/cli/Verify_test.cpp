@@ -47,7 +47,7 @@ std::vector<std::string> Findings(const nlohmann::json& document) {
 
 class VerifyDemoTest : public DemoTest {};
 
-TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
+TEST_F(VerifyDemoTest, TheScheduleListsErrorsFirstThenIgnoredOnesAndExitsTwo) {
     const Outcome outcome = Run({"--schedule"});
     EXPECT_EQ(outcome.status, 2);
     EXPECT_EQ(outcome.err, "");
@@ -60,6 +60,20 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "\n"
                   "    [EXPECTED]: 1.0.0.0\n"
                   "    [FOUND]: 0.9.4.2\n"
+                  "Error 23: Sequence file does not exist\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Fireworks.las\n"
+                  "    [SHOW]: show " +
+                  shows +
+                  "Weekend.lss\n"
+                  "Error 26: Media file does not exist\n"
+                  "    [FILE]: " +
+                  MediaFile("Jingle.mp3") +
+                  "\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Jingle.lms\n"
                   "Warning 33: Musical file used in non-audio section of show\n"
                   "    [SEQUENCE]: " +
                   sequences +
@@ -68,13 +82,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   shows +
                   "Weekend.lss\n"
                   "    [SECTION]: background\n"
-                  "Error 23: Sequence file does not exist\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Fireworks.las\n"
-                  "    [SHOW]: show " +
-                  shows +
-                  "Weekend.lss\n"
                   "Warning 43: Channel conflict\n"
                   "    [SHOW]: " +
                   shows +
@@ -103,13 +110,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "Goodnight.las\n"
                   "    [TRACK]: Track 1: Drive\n"
                   "    [CHANNEL]: Driveway\n"
-                  "Error 26: Media file does not exist\n"
-                  "    [FILE]: " +
-                  MediaFile("Jingle.mp3") +
-                  "\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Jingle.lms\n"
                   "\n"
                   "Ignored results:\n"
                   "Warning 6: Verifier not running from VTR application path\n"
