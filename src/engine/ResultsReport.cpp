@@ -24,15 +24,7 @@ std::string ReportText() {
         if (!first)
             text += std::string(79, '=') + "\r\n";
         first = false;
-        text += "Message Number: " + std::to_string(result->MessageNumber()) + "\r\n";
-        text += "Severity: " + result->SeverityText() + "\r\n";
-        text += "Description: " + result->Summary() + "\r\n";
-        const auto& details = result->Details();
-        for (std::size_t i = 0; i < details.size(); ++i) {
-            const std::string label =
-                details.size() == 1 ? "Detail" : "Detail #" + std::to_string(i + 1);
-            text += label + ": " + details[i] + "\r\n";
-        }
+        text += ResultText(*result);
     }
     return text;
 }
@@ -42,6 +34,22 @@ std::string SystemText(int error) {
 }
 
 }  // namespace
+
+std::string ResultText(const Result& result, std::string_view lineEnd) {
+    std::string text = "Message Number: " + std::to_string(result.MessageNumber());
+    text += lineEnd;
+    text += "Severity: " + result.SeverityText();
+    text += lineEnd;
+    text += "Description: " + result.Summary();
+    text += lineEnd;
+    const auto& details = result.Details();
+    for (std::size_t i = 0; i < details.size(); ++i) {
+        text += details.size() == 1 ? std::string("Detail") : "Detail #" + std::to_string(i + 1);
+        text += ": " + details[i];
+        text += lineEnd;
+    }
+    return text;
+}
 
 void SaveResultsReport(const std::string& fileName) {
     std::FILE* file = nullptr;

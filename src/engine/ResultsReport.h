@@ -1,6 +1,9 @@
 #pragma once
 
 #include <string>
+#include <string_view>
+
+#include "engine/Result.h"
 
 // The plain-text report of a run's results.
 namespace vtr::ResultsReport {
@@ -11,6 +14,11 @@ namespace vtr::ResultsReport {
 // more; every line ends in CR LF. No header, footer or blank line; no results give an
 // empty file. On failure the file is closed and the error raised again.
 void SaveResultsReport(const std::string& fileName);
+
+// One result as the report writes it: its "Message Number: ", "Severity: " and
+// "Description: " lines and its detail lines, each ending in lineEnd. (The window copies a
+// result to the clipboard in this form.)
+std::string ResultText(const Result& result, std::string_view lineEnd = "\r\n");
 
 // What the window's save dialog for the report shows and allows. Cancelling it saves
 // nothing.
