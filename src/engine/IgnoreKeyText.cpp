@@ -1,5 +1,6 @@
 #include "engine/IgnoreKeyText.h"
 
+#include <charconv>
 #include <cstdint>
 
 namespace vtr::IgnoreKeyText {
@@ -41,16 +42,6 @@ std::size_t CharacterLength(std::string_view bytes) {
 
 bool IsControl(unsigned char byte) {
     return byte < 0x20 || byte == 0x7F;
-}
-
-int HexValue(char c) {
-    if (c >= '0' && c <= '9')
-        return c - '0';
-    if (c >= 'a' && c <= 'f')
-        return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F')
-        return c - 'A' + 10;
-    return -1;
 }
 
 }  // namespace
@@ -110,11 +101,12 @@ std::optional<std::string> Decode(std::string_view text) {
         }
         if (i + 3 >= text.size() || text[i + 1] != 'x')
             return std::nullopt;
-        const int high = HexValue(text[i + 2]);
-        const int low = HexValue(text[i + 3]);
-        if (high < 0 || low < 0)
+        unsigned int byte = 0;
+        const char* digits = text.data() + i + 2;
+        const auto [end, error] = std::from_chars(digits, digits + 2, byte, 16);
+        if (error != std::errc() || end != digits + 2)
             return std::nullopt;
-        key += static_cast<char>(high * 16 + low);
+        key += static_cast<char>(byte);
         i += 3;
     }
     return key;
