@@ -3,14 +3,18 @@
 #include <exception>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <ostream>
 #include <string>
 #include <system_error>
 #include <vector>
 
+#include "Baseline.h"
 #include "IgnoreCommands.h"
 #include "Interrupt.h"
+#include "ReportFile.h"
 #include "ResultsOutput.h"
+#include "Terminal.h"
 #include "engine/LibVerify.h"
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
@@ -109,7 +113,7 @@ class TempFilesRemover {
 };
 
 constexpr const char* kReportWhat = "results file";
-constexpr const char* kReportSource = "vantori-verify --output";
+constexpr const char* kReportSource = "vantori-verify";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -164,6 +168,14 @@ int RunVerify(const Options& givenOptions, Console& console) {
         options.targetFile = AbsoluteTarget(options.targetFile);
     if (const std::string problem = SetUpProblem(options); !problem.empty()) {
         Fail(console.err, problem);
+        return ExitStatus::CannotSetUp;
+    }
+    std::optional<Baseline> baseline;
+    try {
+        if (options.baseline)
+            baseline = Baseline::Read(*options.baseline);
+    } catch (const VtrError& error) {
+        Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
     }
 
@@ -227,17 +239,37 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.targetFile = options.targetFile;
     record.cancelled = observer.Cancelled() || LibVerify::IsCancelled();
     record.checksPerformed = LibVerify::ChecksPerformedCount();
-    record.errors = LibVerify::ErrorCount();
-    record.warnings = LibVerify::WarningCount();
     record.results = observer.TakeResults();
+    if (baseline)
+        baseline->Mark(record);
+
+    Presentation presentation;
+    presentation.minimumSeverity = options.minimumSeverity;
+    presentation.groupBy = options.groupBy;
+    presentation.statistics = options.statistics;
+    presentation.failOn = options.failOn;
+    presentation.color = UseColor(options.color, console.outIsColorTerminal);
+    presentation.baselineFile = options.baseline;
 
     // A cancelled run found less than there is: whatever it found, it is not a result.
-    int status = record.cancelled ? ExitStatus::Cancelled : ExitStatusOf(record);
+    int status = record.cancelled ? ExitStatus::Cancelled : ExitStatusOf(record, options.failOn);
     if (options.output) {
         // Never over a file the run read or checked (the report writer refuses it), and
         // whole or not at all.
         try {
-            ResultsReport::SaveResultsReport(*options.output);
+            SaveReport(*options.output, record, presentation);
+        } catch (const VtrError& error) {
+            Fail(console.err, error.Description());
+            status = ExitStatus::CannotSetUp;
+        }
+    }
+    if (options.writeBaseline && record.cancelled) {
+        Fail(console.err, "the baseline " + *options.writeBaseline +
+                              " was not written: the verification was cancelled");
+    } else if (options.writeBaseline) {
+        try {
+            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), "baseline",
+                              kReportSource);
         } catch (const VtrError& error) {
             Fail(console.err, error.Description());
             status = ExitStatus::CannotSetUp;
@@ -247,9 +279,9 @@ int RunVerify(const Options& givenOptions, Console& console) {
     interrupts.reset();
 
     if (options.format == OutputFormat::Json)
-        WriteJson(console.out, record);
+        WriteJson(console.out, record, presentation);
     else
-        WriteText(console.out, record);
+        WriteText(console.out, record, presentation);
     console.out.flush();
     return status;
 }

@@ -47,7 +47,7 @@ std::vector<std::string> Findings(const nlohmann::json& document) {
 
 class VerifyDemoTest : public DemoTest {};
 
-TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
+TEST_F(VerifyDemoTest, TheScheduleListsErrorsFirstThenIgnoredOnesAndExitsTwo) {
     const Outcome outcome = Run({"--schedule"});
     EXPECT_EQ(outcome.status, 2);
     EXPECT_EQ(outcome.err, "");
@@ -60,6 +60,20 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "\n"
                   "    [EXPECTED]: 1.0.0.0\n"
                   "    [FOUND]: 0.9.4.2\n"
+                  "Error 23: Sequence file does not exist\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Fireworks.las\n"
+                  "    [SHOW]: show " +
+                  shows +
+                  "Weekend.lss\n"
+                  "Error 26: Media file does not exist\n"
+                  "    [FILE]: " +
+                  MediaFile("Jingle.mp3") +
+                  "\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Jingle.lms\n"
                   "Warning 33: Musical file used in non-audio section of show\n"
                   "    [SEQUENCE]: " +
                   sequences +
@@ -68,13 +82,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   shows +
                   "Weekend.lss\n"
                   "    [SECTION]: background\n"
-                  "Error 23: Sequence file does not exist\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Fireworks.las\n"
-                  "    [SHOW]: show " +
-                  shows +
-                  "Weekend.lss\n"
                   "Warning 43: Channel conflict\n"
                   "    [SHOW]: " +
                   shows +
@@ -103,13 +110,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "Goodnight.las\n"
                   "    [TRACK]: Track 1: Drive\n"
                   "    [CHANNEL]: Driveway\n"
-                  "Error 26: Media file does not exist\n"
-                  "    [FILE]: " +
-                  MediaFile("Jingle.mp3") +
-                  "\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Jingle.lms\n"
                   "\n"
                   "Ignored results:\n"
                   "Warning 6: Verifier not running from VTR application path\n"
@@ -361,6 +361,9 @@ TEST_F(VerifyDemoTest, TheReportNeverReplacesAFileTheRunReadOrCheckedWhateverNam
     cases.push_back({folder_.File("hard.txt"), Demo("data/sequences/Intro.las")});
     fs::create_symlink(MediaFile("Jingle.mp3"), folder_.File("dangling.txt"));
     cases.push_back({folder_.File("dangling.txt"), MediaFile("Jingle.mp3")});
+    // The JSON report is refused alike.
+    fs::create_symlink(Demo("data/sequences/Carol.lms"), folder_.File("link.json"));
+    cases.push_back({folder_.File("link.json"), Demo("data/sequences/Carol.lms")});
 #endif
     const auto before = Snapshot();
     for (const auto& [output, file] : cases) {
@@ -376,6 +379,13 @@ TEST_F(VerifyDemoTest, TheReportNeverReplacesAFileTheRunReadOrCheckedWhateverNam
         EXPECT_THAT(outcome.err, EndsWith("; the verifier never changes the files it verifies. "
                                           "Choose another file.\n"));
     }
+    // So is a baseline.
+    const Outcome baseline = Run({"--schedule", "--write-baseline", Demo("userdata/shellcmd.map")});
+    EXPECT_EQ(baseline.status, 3);
+    EXPECT_EQ(baseline.err, "vantori-verify: Cannot save the baseline as " +
+                                Demo("userdata/shellcmd.map") +
+                                ": this verification checked that file; the verifier never "
+                                "changes the files it verifies. Choose another file.\n");
     EXPECT_EQ(Snapshot(), before);
 #ifndef _WIN32
     EXPECT_TRUE(fs::is_symlink(folder_.File("dangling.txt")));
