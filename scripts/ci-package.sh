@@ -88,7 +88,7 @@ for option in $(grep -oE -- '--[a-z][a-z-]*' <<<"$help" | sort -u); do
     grep -qF -- "$option" <<<"$manual" ||
         fail "the manual page of vantori-verify does not describe $option"
 done
-for command in $(sed -n '/^Subcommands:/,/^$/p' <<<"$help" | awk 'NR > 1 && NF {print $1}'); do
+for command in $(sed -nE '/^(Sub)?[Cc]ommands:/,/^$/p' <<<"$help" | awk 'NR > 1 && NF {print $1}'); do
     grep -qE "^\.B $command( |$)" <<<"$manual" ||
         fail "the manual page of vantori-verify does not describe the command $command"
 done
