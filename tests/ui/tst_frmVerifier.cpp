@@ -790,6 +790,18 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
     QVERIFY(dialogs_->boxes[0].text.startsWith(
         QString::fromStdString("Cannot create the results file " + unwritable)));
+
+    // Never over a file of the suite that the window reads, such as its help file.
+    const std::string helpFile = AppFolder() + "/VTRHelp.chm";
+    vtr::testsupport::WriteFileBytes(helpFile, "help");
+    dialogs_->boxes.clear();
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(helpFile); };
+    Click("cmdSave");
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
+    QVERIFY(dialogs_->boxes[0].text.startsWith(
+        QString::fromStdString("Cannot save the results file as " + helpFile)));
+    QCOMPARE(vtr::testsupport::ReadFileBytes(helpFile), std::string("help"));
 }
 
 void FrmVerifierTest::targetDialogsAndTheirFailures() {
