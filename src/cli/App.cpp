@@ -175,6 +175,11 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, problem);
         return ExitStatus::CannotSetUp;
     }
+    // A store that is missing or cannot be read still gives a verification (with no
+    // settings), but the user is told first which store it was and why it was that one.
+    const RegistryStore::Description store = RegistryStore::Describe();
+    if (const std::string problem = store.Problem(); !problem.empty())
+        Fail(console.err, problem);
 
     std::unique_ptr<ProgressLine> progress;
     if (console.errIsTerminal && !options.quiet)
@@ -228,6 +233,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.errors = LibVerify::ErrorCount();
     record.warnings = LibVerify::WarningCount();
     record.results = observer.TakeResults();
+    record.store = store;
 
     int status = ExitStatusOf(record);
     if (options.output) {
@@ -266,6 +272,9 @@ int Main(int argc, const char* const* argv, Console& console) {
             case Command::Unignore:
                 return RunIgnoreCommand(options, console.out, console.err);
             case Command::ListIgnored:
+                if (const std::string problem = RegistryStore::Describe().Problem();
+                    !problem.empty())
+                    Fail(console.err, problem);
                 return RunListIgnored(options, console.out);
         }
         return ExitStatus::Usage;

@@ -8,7 +8,7 @@
 
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
-#include "environment/RegistryStore.h"
+#include "engine/VtrError.h"
 
 namespace vtr::cli {
 namespace {
@@ -20,11 +20,6 @@ void ReloadIgnoreLists() {
     LibVerify::IgnoredMessageNumbers().Clear();
     LibVerify::IgnoredResultKeys().Clear();
     IgnoreLists::LoadIgnoreLists();
-}
-
-std::string StoreName() {
-    const auto file = RegistryStore::CurrentFile();
-    return file ? "the settings store " + *file : std::string("the registry");
 }
 
 std::string Quoted(const std::string& text) {
@@ -60,21 +55,14 @@ std::optional<Result> ResultFromIgnoreKey(const std::string& key) {
 
 int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& err) {
     const bool ignore = options.command == Command::Ignore;
-    ReloadIgnoreLists();
 
     std::string what;
-    bool listed = false;
+    std::optional<Result> result;
     if (options.messageNumber) {
-        const std::string text = std::to_string(*options.messageNumber);
-        what = "Results with message number " + text;
-        listed = IgnoreLists::IsMessageNumberIgnored(text);
-        if (ignore)
-            IgnoreLists::IgnoreMessageNumber(*options.messageNumber);
-        else
-            IgnoreLists::UnignoreMessageNumber(*options.messageNumber);
+        what = "Results with message number " + std::to_string(*options.messageNumber);
     } else {
         const std::string key = options.ignoreKey.value_or("");
-        const std::optional<Result> result = ResultFromIgnoreKey(key);
+        result = ResultFromIgnoreKey(key);
         if (!result) {
             err << "vantori-verify: " << Quoted(key)
                 << " is not a result's key: a key is the message number, \"-\", then each "
@@ -83,25 +71,24 @@ int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& er
             return ExitStatus::Usage;
         }
         what = "The result " + Quoted(key);
-        listed = IgnoreLists::IsIgnoreKeyIgnored(key);
-        if (ignore)
-            IgnoreLists::IgnoreResult(*result);
-        else
-            IgnoreLists::UnignoreResult(*result);
     }
 
-    // The lists swallow store failures; read them back to see whether the change was kept.
-    if (listed != ignore) {
-        ReloadIgnoreLists();
-        const bool nowListed =
-            options.messageNumber
-                ? IgnoreLists::IsMessageNumberIgnored(std::to_string(*options.messageNumber))
-                : IgnoreLists::IsIgnoreKeyIgnored(*options.ignoreKey);
-        if (nowListed != ignore) {
-            err << "vantori-verify: the ignore list could not be saved in " << StoreName() << "\n";
-            return ExitStatus::CannotSetUp;
+    // One change of the list in the store, under its lock; a failure says what went wrong.
+    IgnoreLists::ChangeOutcome outcome;
+    try {
+        if (options.messageNumber) {
+            outcome = ignore ? IgnoreLists::AddIgnoredMessageNumber(*options.messageNumber)
+                             : IgnoreLists::RemoveIgnoredMessageNumber(*options.messageNumber);
+        } else {
+            outcome = ignore ? IgnoreLists::AddIgnoredResultKey(result->IgnoreKey())
+                             : IgnoreLists::RemoveIgnoredResultKey(result->IgnoreKey());
         }
+    } catch (const VtrError& error) {
+        err << "vantori-verify: " << error.Description() << "\n";
+        return ExitStatus::CannotSetUp;
     }
+    const bool listed = outcome == IgnoreLists::ChangeOutcome::AlreadyListed ||
+                        outcome == IgnoreLists::ChangeOutcome::Removed;
 
     const bool plural = options.messageNumber.has_value();
     if (ignore) {

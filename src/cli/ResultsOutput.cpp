@@ -82,8 +82,16 @@ void WriteJson(std::ostream& out, const RunRecord& record) {
         results.push_back(std::move(item));
     }
 
+    nlohmann::ordered_json store;
+    store["path"] = record.store.file ? nlohmann::ordered_json(*record.store.file) : nullptr;
+    store["chosenBy"] = record.store.OriginWord();
+    store["exists"] = record.store.condition.exists;
+    store["understood"] = record.store.condition.understood;
+    store["readOnly"] = record.store.condition.readOnly;
+
     nlohmann::ordered_json document;
     document["target"] = std::move(target);
+    document["store"] = std::move(store);
     document["cancelled"] = record.cancelled;
     document["checksPerformed"] = record.checksPerformed;
     document["errors"] = record.errors;

@@ -7,6 +7,7 @@
 
 #include "CommandLine.h"
 #include "engine/Result.h"
+#include "environment/RegistryStore.h"
 
 namespace vtr::cli {
 
@@ -25,6 +26,7 @@ struct RunRecord {
     int32_t errors = 0;                   // not-ignored errors
     int32_t warnings = 0;                 // not-ignored warnings
     std::vector<RecordedResult> results;  // every result in the order produced
+    RegistryStore::Description store;     // the settings store the run read
 };
 
 // 0 with no warning or error, 1 with warnings only, 2 with errors.
@@ -39,10 +41,11 @@ int ExitStatusOf(const RunRecord& record);
 void WriteText(std::ostream& out, const RunRecord& record);
 
 // The JSON form: one object with "target" ({"kind", "file"}; no "file" for the schedule),
-// "cancelled", "checksPerformed", "errors", "warnings" and "results", every result in the
-// order produced with "severity" (number), "severityText", "messageNumber", "helpContextId",
-// "summary", "details" (array), "ignored" and "ignoreKey". Bytes that are not UTF-8 are
-// written as U+FFFD.
+// "store" ({"path" (null for the Windows registry), "chosenBy" ("option", "environment",
+// "default" or "registry"), "exists", "understood", "readOnly"}), "cancelled", "checksPerformed",
+// "errors", "warnings" and "results", every result in the order produced with "severity" (number),
+// "severityText", "messageNumber", "helpContextId", "summary", "details" (array), "ignored" and
+// "ignoreKey". Bytes that are not UTF-8 are written as U+FFFD.
 void WriteJson(std::ostream& out, const RunRecord& record);
 
 // The summary line of the text form, without its line break.
