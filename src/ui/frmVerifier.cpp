@@ -2,6 +2,7 @@
 
 #include <QAction>
 #include <QApplication>
+#include <QClipboard>
 #include <QCloseEvent>
 #include <QCursor>
 #include <QDir>
@@ -23,6 +24,7 @@
 #include <QScrollBar>
 #include <QSettings>
 #include <QShortcut>
+#include <QSplitter>
 #include <QStyle>
 #include <QTabWidget>
 #include <QTextBlock>
@@ -32,6 +34,7 @@
 #include <algorithm>
 #include <exception>
 
+#include "ResultDetailsPane.h"
 #include "UiText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
@@ -56,6 +59,8 @@ const QString kErrorSavingMessages = QStringLiteral("Error Saving Verifier Messa
 const QString kHelpContextError = QStringLiteral("Help Context Error");
 const QString kHelpFileError = QStringLiteral("Help File Error");
 const QString kDoubleClickError = QStringLiteral("Details List Double Click Error");
+const QString kIgnoreListError = QStringLiteral("Ignore List Error");
+const QString kOpenFolderError = QStringLiteral("Error Opening Folder");
 
 // Settings of the window's own file.
 const QString kGeometryKey = QStringLiteral("window/geometry");
@@ -64,6 +69,9 @@ const QString kTargetSequenceKey = QStringLiteral("target/sequence");
 const QString kTargetShowKey = QStringLiteral("target/show");
 
 constexpr int kDetailColumns = 9;
+
+// The progress bar's text while a run goes and after it completed.
+const QString kProgressFormat = QStringLiteral("%v of %m checks");
 
 // A list item: the result it shows (its tag) and the order in which results were listed,
 // so that a result moved between the lists lands where it was produced.
@@ -110,6 +118,18 @@ TargetKind KindOfFile(const QString& path) {
     if (suffix == QLatin1String("las") || suffix == QLatin1String("lms"))
         return TargetKind::Sequence;
     return TargetKind::None;
+}
+
+// A target file as the window verifies and remembers it: absolute, relative names taken from
+// the working folder, "." and ".." resolved, in the system's own notation. The results name
+// the file this way, and so does the key that ignores one of them, wherever the window is
+// opened next. Empty stays empty.
+QString AbsoluteTarget(const QString& path) {
+    const QString trimmed = path.trimmed();
+    if (trimmed.isEmpty())
+        return trimmed;
+    return QDir::toNativeSeparators(
+        QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
 }
 
 QString ErrorText(const std::exception& error) {
@@ -298,11 +318,8 @@ void frmVerifier::BuildControls() {
     rtxOutputLog_->setUndoRedoEnabled(false);
     rtxOutputLog_->setTextInteractionFlags(Qt::TextSelectableByMouse |
                                            Qt::TextSelectableByKeyboard);
-    // The severity colours are chosen for a light page, whatever the desktop's theme.
-    QPalette logPalette = rtxOutputLog_->palette();
-    logPalette.setColor(QPalette::Base, Qt::white);
-    logPalette.setColor(QPalette::Text, Qt::black);
-    rtxOutputLog_->setPalette(logPalette);
+    // The lines' colours follow the palette: chosen again whenever it changes.
+    rtxOutputLog_->installEventFilter(this);
     imlSeverity_ = new SeverityImageList(this);
     lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"));
     lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"));
@@ -360,9 +377,24 @@ void frmVerifier::BuildControls() {
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(frameSummary_, 1);
     bottom->addLayout(buttons);
+    // The selected result whole, under the lists; the user sets the share of each.
+    fraResultDetails_ = new ResultDetailsPane(central);
+    auto* splitter = new QSplitter(Qt::Vertical, central);
+    splitter->setObjectName(QStringLiteral("splDetails"));
+    splitter->addWidget(sstDetails_);
+    splitter->addWidget(fraResultDetails_);
+    splitter->setStretchFactor(0, 3);
+    splitter->setStretchFactor(1, 1);
+    splitter->setSizes({400, fontMetrics().height() * 12});
+    splitter->setChildrenCollapsible(false);
+    connect(sstDetails_, &QTabWidget::currentChanged, this, [this] { ShowSelectedResult(); });
+    connect(fraResultDetails_, &ResultDetailsPane::HelpRequested, this, &frmVerifier::HelpOnResult);
+    connect(fraResultDetails_, &ResultDetailsPane::OpenFolderRequested, this,
+            &frmVerifier::OpenFolder);
+
     auto* layout = new QVBoxLayout(central);
     layout->addWidget(frameTarget_);
-    layout->addWidget(sstDetails_, 1);
+    layout->addWidget(splitter, 1);
     layout->addLayout(bottom);
 
     // Progress of a run and the passing status text, beside the counts.
@@ -370,7 +402,7 @@ void frmVerifier::BuildControls() {
     prgVerification_->setObjectName(QStringLiteral("prgVerification"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
-    prgVerification_->setFormat(QStringLiteral("%v of %m checks"));
+    prgVerification_->setFormat(kProgressFormat);
     prgVerification_->setAccessibleName(QStringLiteral("Verification progress"));
     lblStatus_ = new QLabel(frameSummary_);
     lblStatus_->setObjectName(QStringLiteral("lblStatus"));
@@ -380,7 +412,8 @@ void frmVerifier::BuildControls() {
     summaryLayout->addWidget(lblStatus_, 1, 4);
 
     setAcceptDrops(true);
-    resize(900, 640);
+    resize(1040, 740);
+    ShowSelectedResult();
 }
 
 QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
@@ -413,6 +446,9 @@ QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
             [this, list](const QPoint& position) { ShowResultPopup(list, position); });
     connect(list, &QTreeWidget::itemDoubleClicked, this,
             [this](QTreeWidgetItem* item) { OpenResult(ResultOf(item)); });
+    connect(list, &QTreeWidget::currentItemChanged, this, [this] { ShowSelectedResult(); });
+    auto* copy = new QShortcut(QKeySequence::Copy, list, nullptr, nullptr, Qt::WidgetShortcut);
+    connect(copy, &QShortcut::activated, this, [this, list] { CopyResult(SelectedResult(list)); });
     auto* open =
         new QShortcut(QKeySequence(Qt::Key_Return), list, nullptr, nullptr, Qt::WidgetShortcut);
     auto* openEnter =
@@ -420,17 +456,31 @@ QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
     for (QShortcut* shortcut : {open, openEnter})
         connect(shortcut, &QShortcut::activated, this,
                 [this, list] { OpenResult(SelectedResult(list)); });
+    // Delete ignores a result of the Results list, and stops ignoring one of the Ignored
+    // Results list; with Shift, all results with its message number.
+    const bool ignoredList = name == QLatin1String("lvResults2");
     auto* ignore = new QShortcut(QKeySequence::Delete, list, nullptr, nullptr, Qt::WidgetShortcut);
-    connect(ignore, &QShortcut::activated, this,
-            [this, list] { IgnoreResult(SelectedResult(list)); });
+    connect(ignore, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringResult(SelectedResult(list));
+        } else {
+            IgnoreResult(SelectedResult(list));
+        }
+    });
     auto* ignoreNumber = new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete), list, nullptr,
                                        nullptr, Qt::WidgetShortcut);
-    connect(ignoreNumber, &QShortcut::activated, this,
-            [this, list] { IgnoreMessageNumber(SelectedResult(list)); });
+    connect(ignoreNumber, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringMessageNumber(SelectedResult(list));
+        } else {
+            IgnoreMessageNumber(SelectedResult(list));
+        }
+    });
     return list;
 }
 
 void frmVerifier::BuildMenus() {
+    // The Results list's pop-up menu.
     mnuResultPopup_ = new QMenu(this);
     mnuResultPopup_->setObjectName(QStringLiteral("mnuResultPopup"));
     mnuHelpOnResult_ = mnuResultPopup_->addAction(QStringLiteral("Help on this result"));
@@ -448,6 +498,34 @@ void frmVerifier::BuildMenus() {
     connect(mnuIgnoreResult_, &QAction::triggered, this, [this] { IgnoreResult(popupResult_); });
     connect(mnuIgnoreMessageNumber_, &QAction::triggered, this,
             [this] { IgnoreMessageNumber(popupResult_); });
+
+    // The Ignored Results list's: the way back.
+    mnuIgnoredPopup_ = new QMenu(this);
+    mnuIgnoredPopup_->setObjectName(QStringLiteral("mnuIgnoredPopup"));
+    QAction* help = mnuIgnoredPopup_->addAction(QStringLiteral("Help on this result"));
+    help->setShortcut(QKeySequence(Qt::Key_F1));
+    mnuIgnoredPopup_->addSeparator();
+    mnuStopIgnoringResult_ =
+        mnuIgnoredPopup_->addAction(QStringLiteral("Stop ignoring this result"));
+    mnuStopIgnoringResult_->setObjectName(QStringLiteral("mnuStopIgnoringResult"));
+    mnuStopIgnoringResult_->setShortcut(QKeySequence::Delete);
+    mnuStopIgnoringMessageNumber_ = mnuIgnoredPopup_->addAction(
+        QStringLiteral("Stop ignoring all results with this message number"));
+    mnuStopIgnoringMessageNumber_->setObjectName(QStringLiteral("mnuStopIgnoringMessageNumber"));
+    mnuStopIgnoringMessageNumber_->setShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete));
+    connect(help, &QAction::triggered, this, [this] { HelpOnResult(popupResult_); });
+    connect(mnuStopIgnoringResult_, &QAction::triggered, this,
+            [this] { StopIgnoringResult(popupResult_); });
+    connect(mnuStopIgnoringMessageNumber_, &QAction::triggered, this,
+            [this] { StopIgnoringMessageNumber(popupResult_); });
+
+    // Both: the result as text.
+    for (QMenu* menu : {mnuResultPopup_, mnuIgnoredPopup_}) {
+        menu->addSeparator();
+        QAction* copy = menu->addAction(QStringLiteral("Copy"));
+        copy->setShortcut(QKeySequence::Copy);
+        connect(copy, &QAction::triggered, this, [this] { CopyResult(popupResult_); });
+    }
 
     // Keyboard access to the commands beyond the buttons' own letters.
     auto addShortcut = [this](const QKeySequence& keys, auto&& command) {
@@ -488,8 +566,8 @@ void frmVerifier::LoadPlacement() {
     const QByteArray geometry = settings.value(kGeometryKey).toByteArray();
     if (!geometry.isEmpty())
         restoreGeometry(geometry);
-    txtTargetSequence_->setText(settings.value(kTargetSequenceKey).toString());
-    txtTargetShow_->setText(settings.value(kTargetShowKey).toString());
+    txtTargetSequence_->setText(AbsoluteTarget(settings.value(kTargetSequenceKey).toString()));
+    txtTargetShow_->setText(AbsoluteTarget(settings.value(kTargetShowKey).toString()));
     const QString kind = settings.value(kTargetKindKey).toString();
     if (kind == QLatin1String("sequence")) {
         optTargetSequence_->setChecked(true);
@@ -503,8 +581,8 @@ void frmVerifier::LoadPlacement() {
 void frmVerifier::SavePlacement() const {
     QSettings settings(settingsFile_, QSettings::IniFormat);
     settings.setValue(kGeometryKey, saveGeometry());
-    settings.setValue(kTargetSequenceKey, txtTargetSequence_->text());
-    settings.setValue(kTargetShowKey, txtTargetShow_->text());
+    settings.setValue(kTargetSequenceKey, AbsoluteTarget(txtTargetSequence_->text()));
+    settings.setValue(kTargetShowKey, AbsoluteTarget(txtTargetShow_->text()));
     settings.setValue(kTargetKindKey, optTargetSequence_->isChecked() ? QStringLiteral("sequence")
                                       : optTargetShow_->isChecked()   ? QStringLiteral("show")
                                                                       : QStringLiteral("schedule"));
@@ -550,9 +628,10 @@ void frmVerifier::dropEvent(QDropEvent* event) {
         event->acceptProposedAction();
 }
 
-bool frmVerifier::SetTargetFile(const QString& path) {
+bool frmVerifier::SetTargetFile(const QString& file) {
     if (running_)
         return false;
+    const QString path = AbsoluteTarget(file);
     switch (KindOfFile(path)) {
         case TargetKind::Sequence:
             txtTargetSequence_->setText(path);
@@ -591,6 +670,8 @@ void frmVerifier::ResetSummary() {
         count->setText(QStringLiteral("0"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
+    runCancelled_ = false;
+    checksDropped_ = 0;
 }
 
 void frmVerifier::SummaryChanged() {
@@ -613,11 +694,15 @@ void frmVerifier::RefreshSummary() {
     const int32_t remaining = LibVerify::ChecksRemainingCount();
     lblChecksPerformedCount_->setText(QString::number(performed));
     lblChecksRemainingCount_->setText(QString::number(remaining));
-    lblErrorsCount_->setText(QString::number(LibVerify::ErrorCount()));
-    lblWarningsCount_->setText(QString::number(LibVerify::WarningCount()));
-    const int total = std::max(1, performed + remaining);
+    // The errors and warnings the Results list shows: the driver's counts until the user
+    // ignores or stops ignoring a result, the list's own from then on.
+    lblErrorsCount_->setText(QString::number(errorsListed_));
+    lblWarningsCount_->setText(QString::number(warningsListed_));
+    // A cancelled run stops short of the checks it dropped, and says so.
+    const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
     prgVerification_->setValue(std::min(performed, total));
+    prgVerification_->setFormat(runCancelled_ ? QStringLiteral("Cancelled") : kProgressFormat);
 }
 
 // --- The output log ------------------------------------------------------------------------
@@ -628,15 +713,39 @@ QColor ToQColor(const OutputLog::Colour& colour) {
     return QColor(colour.red, colour.green, colour.blue);
 }
 
-}  // namespace
+// Each line of the log carries what its colour stands for, so that it can be coloured again
+// when the palette changes: a severity's number, or kPlainLine.
+constexpr int kLogLineKind = QTextFormat::UserProperty + 1;
+constexpr int kPlainLine = -1;
 
-QColor frmVerifier::SeverityColour(Severity severity) {
-    return ToQColor(OutputLog::ResultColour(severity));
+bool IsDarkPage(const QPalette& palette) {
+    return palette.color(QPalette::Base).lightness() < 128;
 }
 
-void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
+}  // namespace
+
+QColor frmVerifier::LogColour(int kind, const QPalette& palette) {
+    const bool dark = IsDarkPage(palette);
+    if (kind == kPlainLine)
+        return dark ? palette.color(QPalette::Text) : ToQColor(OutputLog::kBlack);
+    const auto severity = static_cast<Severity>(kind);
+    if (!dark)
+        return ToQColor(OutputLog::ResultColour(severity));
+    // On a dark page the same hues, lighter, so that they stand out as well as on a light one.
+    switch (severity) {
+        case Severity::Info:
+            return QColor(110, 160, 255);
+        case Severity::Warning:
+            return QColor(255, 170, 70);
+        case Severity::Error:
+            return QColor(255, 110, 110);
+    }
+    return palette.color(QPalette::Text);
+}
+
+void frmVerifier::WriteLog(const QString& text, int kind) {
     // The time stamp is taken now, whenever the line reaches the screen.
-    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), colour});
+    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), kind});
     if (!running_)
         FlushLog();
 }
@@ -644,12 +753,14 @@ void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
 void frmVerifier::FlushLog() {
     if (pendingLog_.isEmpty())
         return;
+    const QPalette palette = rtxOutputLog_->palette();
     QTextCursor cursor(rtxOutputLog_->document());
     cursor.movePosition(QTextCursor::End);
     cursor.beginEditBlock();
     for (const LogLine& line : std::as_const(pendingLog_)) {
         QTextCharFormat format;
-        format.setForeground(line.colour);
+        format.setForeground(LogColour(line.kind, palette));
+        format.setProperty(kLogLineKind, line.kind);
         // Every line ends with a line break, so the document ends with an empty block.
         cursor.insertText(line.text + QLatin1Char('\n'), format);
     }
@@ -660,10 +771,36 @@ void frmVerifier::FlushLog() {
     scrollBar->setValue(scrollBar->maximum());
 }
 
+void frmVerifier::RecolourLog() {
+    const QPalette palette = rtxOutputLog_->palette();
+    QTextDocument* document = rtxOutputLog_->document();
+    QTextCursor cursor(document);
+    cursor.beginEditBlock();
+    for (QTextBlock block = document->begin(); block.isValid(); block = block.next()) {
+        for (auto fragment = block.begin(); !fragment.atEnd(); ++fragment) {
+            const QTextFragment piece = fragment.fragment();
+            QTextCharFormat format = piece.charFormat();
+            if (!format.hasProperty(kLogLineKind))
+                continue;
+            format.setForeground(LogColour(format.intProperty(kLogLineKind), palette));
+            cursor.setPosition(piece.position());
+            cursor.setPosition(piece.position() + piece.length(), QTextCursor::KeepAnchor);
+            cursor.setCharFormat(format);
+        }
+    }
+    cursor.endEditBlock();
+}
+
+bool frmVerifier::eventFilter(QObject* watched, QEvent* event) {
+    if (watched == rtxOutputLog_ && event->type() == QEvent::PaletteChange)
+        RecolourLog();
+    return QMainWindow::eventFilter(watched, event);
+}
+
 // --- Notification handlers -----------------------------------------------------------------
 
 void frmVerifier::CheckAdded(ICheck& check) {
-    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), ToQColor(OutputLog::kBlack));
+    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), kPlainLine);
     SummaryChanged();
 }
 
@@ -673,13 +810,17 @@ void frmVerifier::CheckCompleted(ICheck&) {
 
 void frmVerifier::Checking(ICheck& check) {
     const QString text = FromSuiteText(OutputLog::CheckingText(check));
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
 void frmVerifier::ChecksCompleted(bool cancelled) {
-    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), ToQColor(OutputLog::kBlack));
-    SetStatus(QString());
+    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), kPlainLine);
+    runCancelled_ = cancelled;
+    SetStatus(cancelled ? QStringLiteral("Cancelled: %1 of %2 checks performed")
+                              .arg(LibVerify::ChecksPerformedCount())
+                              .arg(LibVerify::ChecksPerformedCount() + checksDropped_)
+                        : QString());
     SetRunning(false);
     RefreshSummary();
     sstDetails_->setCurrentIndex(ResultsTab);
@@ -691,7 +832,10 @@ void frmVerifier::Initializing() {
     lvResults_[0]->clear();
     lvResults_[1]->clear();
     popupResult_.reset();
+    fraResultDetails_->ShowResult(nullptr);
     resultsListed_ = 0;
+    errorsListed_ = 0;
+    warningsListed_ = 0;
     SetStatus(QString());
     sstDetails_->setCurrentIndex(OutputLogTab);
 }
@@ -700,13 +844,13 @@ void frmVerifier::ResultAdded(const ResultPtr& result) {
     QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
     AddResultItem(list, result, resultsListed_++);
     SummaryChanged();
-    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), SeverityColour(result->Severity()));
+    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), static_cast<int>(result->Severity()));
     LibVerify::ProcessPendingEvents();
 }
 
 void frmVerifier::TransientMessage(const std::string& message) {
     const QString text = FromSuiteText(message);
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
@@ -741,6 +885,16 @@ void frmVerifier::AddResultItem(QTreeWidget* list, const ResultPtr& result, qint
         tip += QLatin1Char('\n') + details.join(QLatin1Char('\n'));
     item->setToolTip(DescriptionColumn, tip);
     list->addTopLevelItem(item);
+    if (list == lvResults_[0])
+        CountListed(*result, 1);
+}
+
+void frmVerifier::CountListed(const Result& result, int change) {
+    if (result.Severity() == Severity::Error) {
+        errorsListed_ += change;
+    } else if (result.Severity() == Severity::Warning) {
+        warningsListed_ += change;
+    }
 }
 
 void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item) {
@@ -761,6 +915,7 @@ void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* 
         }
     }
     to->insertTopLevelItem(index, resultItem);
+    CountListed(*resultItem->Result(), to == lvResults_[0] ? 1 : -1);
 }
 
 void frmVerifier::RefreshIgnoredResults() {
@@ -782,6 +937,8 @@ void frmVerifier::RefreshIgnoredResults() {
         MoveItem(results, ignored, item);
     for (QTreeWidgetItem* item : toResults)
         MoveItem(ignored, results, item);
+    if (!toIgnored.isEmpty() || !toResults.isEmpty())
+        SummaryChanged();
 }
 
 ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
@@ -792,20 +949,31 @@ ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
 }
 
 void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
-    QTreeWidgetItem* item = list->itemAt(list->viewport()->mapFrom(list, position));
+    // The position comes in the viewport's coordinates, as the list's items are laid out.
+    QTreeWidgetItem* item = list->itemAt(position);
     QPoint at = position;
     if (item == nullptr) {
         // From the keyboard (the menu key): the current item.
         item = list->currentItem();
         if (item == nullptr)
             return;
-        at = list->viewport()->mapTo(list, list->visualItemRect(item).bottomLeft());
+        at = list->visualItemRect(item).bottomLeft();
     }
     list->setCurrentItem(item);
     popupResult_ = ResultOf(item);
     if (!popupResult_)
         return;
-    mnuResultPopup_->popup(list->mapToGlobal(at));
+    QMenu* menu = mnuResultPopup_;
+    if (list == lvResults_[1]) {
+        // An ignored result is listed for its own key, its message number, or both: each
+        // entry offers to take away what is there.
+        mnuStopIgnoringResult_->setEnabled(
+            IgnoreLists::IsIgnoreKeyIgnored(popupResult_->IgnoreKey()));
+        mnuStopIgnoringMessageNumber_->setEnabled(
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(popupResult_->MessageNumber())));
+        menu = mnuIgnoredPopup_;
+    }
+    menu->popup(list->viewport()->mapToGlobal(at));
 }
 
 // --- Commands ------------------------------------------------------------------------------
@@ -830,14 +998,16 @@ void frmVerifier::ShowError(const QString& title, const QString& text) {
 
 void frmVerifier::ApplyTarget() {
     if (optTargetShow_->isChecked()) {
-        const QString show = txtTargetShow_->text().trimmed();
+        const QString show = AbsoluteTarget(txtTargetShow_->text());
         if (show.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the show file to verify");
+        txtTargetShow_->setText(show);
         LibVerify::VerifyShowFile(ToSuiteText(show));
     } else if (optTargetSequence_->isChecked()) {
-        const QString sequence = txtTargetSequence_->text().trimmed();
+        const QString sequence = AbsoluteTarget(txtTargetSequence_->text());
         if (sequence.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the sequence file to verify");
+        txtTargetSequence_->setText(sequence);
         LibVerify::VerifySequenceFile(ToSuiteText(sequence));
     } else {
         LibVerify::SetScheduleFiles(VTRCommon::GetWeeklyScheduleFile(),
@@ -870,7 +1040,12 @@ void frmVerifier::Verify() {
 }
 
 void frmVerifier::Cancel() {
-    Guarded(kVerifierError, [] { LibVerify::CancelVerification(); });
+    Guarded(kVerifierError, [this] {
+        // The queue is emptied: the progress bar keeps room for what it held.
+        if (running_ && !LibVerify::IsCancelled())
+            checksDropped_ = LibVerify::ChecksRemainingCount();
+        LibVerify::CancelVerification();
+    });
 }
 
 std::string frmVerifier::ChooseResultsReportFile() {
@@ -933,21 +1108,68 @@ void frmVerifier::OpenResult(const ResultPtr& result) {
 }
 
 void frmVerifier::IgnoreResult(const ResultPtr& result) {
-    if (!result)
-        return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreResult(*result);
-        RefreshIgnoredResults();
-    });
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreResult(*result); });
 }
 
 void frmVerifier::IgnoreMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreMessageNumber(result->MessageNumber()); });
+}
+
+void frmVerifier::StopIgnoringResult(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreResult(*result); });
+}
+
+void frmVerifier::StopIgnoringMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreMessageNumber(result->MessageNumber()); });
+}
+
+template <typename Change>
+void frmVerifier::ChangeIgnoreLists(const ResultPtr& result, Change&& change) {
     if (!result)
         return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreMessageNumber(result->MessageNumber());
+    Guarded(kIgnoreListError, [&] {
+        change();
         RefreshIgnoredResults();
     });
+    // What the result is ignored by may have changed, whether or not it moved.
+    ShowSelectedResult();
+}
+
+void frmVerifier::CopyResult(const ResultPtr& result) {
+    if (result)
+        QApplication::clipboard()->setText(ResultDetailsPane::ResultText(*result));
+}
+
+void frmVerifier::OpenFolder(const QString& folder) {
+    if (!dialogs_->OpenFolder(this, folder))
+        ShowError(kOpenFolderError, QStringLiteral("Cannot open the folder %1").arg(folder));
+}
+
+void frmVerifier::ShowSelectedResult() {
+    const int tab = sstDetails_->currentIndex();
+    fraResultDetails_->setVisible(tab != OutputLogTab);
+    if (tab == OutputLogTab)
+        return;
+    const bool ignoredList = tab == IgnoredResultsTab;
+    const QTreeWidget* list = lvResults_[ignoredList ? 1 : 0];
+    const ResultPtr result = ResultOf(list->currentItem());
+    if (!result) {
+        fraResultDetails_->ShowResult(nullptr);
+        return;
+    }
+    QString ignoredBy;
+    if (ignoredList) {
+        const bool byKey = IgnoreLists::IsIgnoreKeyIgnored(result->IgnoreKey());
+        const bool byNumber =
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(result->MessageNumber()));
+        const QString number =
+            QStringLiteral("all results with message number %1").arg(result->MessageNumber());
+        ignoredBy = byKey && byNumber ? QStringLiteral("this result, and ") + number
+                    : byKey           ? QStringLiteral("this result")
+                                      : number;
+    }
+    fraResultDetails_->ShowResult(
+        result, imlSeverity_->Image(FromSuiteText(result->SeverityText())), ignoredBy);
 }
 
 void frmVerifier::ChooseTargetSequence() {

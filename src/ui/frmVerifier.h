@@ -29,6 +29,8 @@ class QTreeWidgetItem;
 
 namespace vtr {
 
+class ResultDetailsPane;
+
 // The three severity images of the result lists, keyed "Info", "Warning" and "Error".
 class SeverityImageList : public QObject {
     Q_OBJECT
@@ -99,11 +101,21 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void HelpOnResult(const ResultPtr& result);
     void IgnoreResult(const ResultPtr& result);
     void IgnoreMessageNumber(const ResultPtr& result);
+    // The Ignored Results list's: take the result's key, or its message number, off the
+    // ignore lists (as the command line's unignore does); what is no longer ignored moves
+    // back to the Results list.
+    void StopIgnoringResult(const ResultPtr& result);
+    void StopIgnoringMessageNumber(const ResultPtr& result);
+    // Puts a result on the clipboard as text (the pop-up menus' "Copy", Ctrl+C).
+    void CopyResult(const ResultPtr& result);
+    // Shows a folder in the desktop's file manager ("Open containing folder").
+    void OpenFolder(const QString& folder);
     // A double-click (or Enter) on an item: help on its result.
     void OpenResult(const ResultPtr& result);
 
     // Chooses a file as the target by its kind: "lss" a show, "las"/"lms" a sequence
-    // (any letter case). False, with nothing changed, for anything else or while running.
+    // (any letter case), named by its absolute path (a relative one is taken from the working
+    // folder). False, with nothing changed, for anything else or while running.
     bool SetTargetFile(const QString& path);
 
     // The report dialog: the chosen file name, or "" when the user cancelled.
@@ -115,11 +127,14 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void RefreshIgnoredResults();
     // Sets the four count labels from the driver's counts.
     void RefreshSummary();
-    // Writes one line to the output log: time stamp, ": ", the text, in that colour.
-    void WriteLog(const QString& text, const QColor& colour);
+    // Writes one line to the output log: time stamp, ": ", the text, in the colour of its
+    // kind (a severity's number for a result's line, -1 for any other).
+    void WriteLog(const QString& text, int kind);
 
-    // The log colour of a severity: Info blue, Warning orange, Error red, others black.
-    static QColor SeverityColour(Severity severity);
+    // The log colour of a line's kind on a page of that palette. On a light page: Info
+    // blue, Warning orange, Error red, other lines black. On a dark one: lighter tones of the
+    // same, other lines in the palette's text colour.
+    static QColor LogColour(int kind, const QPalette& palette);
     // The result behind a list item (the item's tag); null for anything else.
     static ResultPtr ResultOf(const QTreeWidgetItem* item);
 
@@ -130,6 +145,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void VerificationFinished(bool cancelled);
 
   protected:
+    bool eventFilter(QObject* watched, QEvent* event) override;
     void closeEvent(QCloseEvent* event) override;
     void dragEnterEvent(QDragEnterEvent* event) override;
     void dropEvent(QDropEvent* event) override;
@@ -151,13 +167,23 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void SetStatus(const QString& text);
     // Writes the log lines kept back while a run goes.
     void FlushLog();
+    // Colours every line of the log again, for the palette now in use.
+    void RecolourLog();
     void ResetSummary();
     void ApplyTarget();
     void ChooseTarget(bool sequence);
     void AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order);
+    // Adds change to the count of the result's severity, if it is counted.
+    void CountListed(const Result& result, int change);
     void MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item);
     void ShowResultPopup(QTreeWidget* list, const QPoint& position);
+    // The details pane follows the selected result of the list shown.
+    void ShowSelectedResult();
     ResultPtr SelectedResult(const QTreeWidget* list) const;
+    // Changes the ignore lists for a result and moves the listed results accordingly; a
+    // failure is shown under "Ignore List Error".
+    template <typename Change>
+    void ChangeIgnoreLists(const ResultPtr& result, Change&& change);
     // Runs a command; a failure is shown in a message box with that title.
     template <typename Command>
     void Guarded(const QString& title, Command&& command);
@@ -181,6 +207,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QPlainTextEdit* rtxOutputLog_ = nullptr;
     QTreeWidget* lvResults_[2] = {nullptr, nullptr};
     SeverityImageList* imlSeverity_ = nullptr;
+    ResultDetailsPane* fraResultDetails_ = nullptr;
     // Summary.
     QGroupBox* frameSummary_ = nullptr;
     QLabel* lblChecksPerformedCount_ = nullptr;
@@ -198,6 +225,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QAction* mnuHelpOnResult_ = nullptr;
     QAction* mnuIgnoreResult_ = nullptr;
     QAction* mnuIgnoreMessageNumber_ = nullptr;
+    QMenu* mnuIgnoredPopup_ = nullptr;
+    QAction* mnuStopIgnoringResult_ = nullptr;
+    QAction* mnuStopIgnoringMessageNumber_ = nullptr;
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
     static constexpr qint64 kRepaintIntervalMs = 50;
@@ -205,13 +235,18 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     bool summaryPending_ = false;
     struct LogLine {
         QString text;
-        QColor colour;
+        int kind;
     };
     QList<LogLine> pendingLog_;
     QString statusText_;
     bool running_ = false;
+    bool runCancelled_ = false;  // the last run ended by cancellation
+    int checksDropped_ = 0;      // the checks its cancellation dropped from the queue
     bool closeWhenFinished_ = false;
     qint64 resultsListed_ = 0;  // the order of the next result listed
+    // The errors and warnings in the Results list.
+    int errorsListed_ = 0;
+    int warningsListed_ = 0;
 };
 
 }  // namespace vtr

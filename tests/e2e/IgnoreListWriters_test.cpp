@@ -45,12 +45,19 @@ struct Change {
     std::string entry;          // the number's text or the key
 };
 
-// Round r, writer w: eight add message numbers, four remove ones the store was given for
-// them, five add result keys and three remove keys the store was given for them.
+// Message numbers of the catalog (which "ignore" takes) that the rounds ignore in turn: each
+// round ignores one set and un-ignores the other, which the round before ignored.
+const int kNumberSets[2][4] = {{1, 2, 4, 5}, {6, 7, 9, 10}};
+
+// Round r, writer w: four ignore message numbers, four un-ignore the numbers of the round
+// before, four un-ignore numbers the store was given for them, five ignore result keys and
+// three un-ignore keys the store was given for them.
 Change ChangeOf(int round, int writer) {
     const std::string tag = "r" + std::to_string(round) + "w" + std::to_string(writer);
+    if (writer < 4)
+        return {true, true, std::to_string(kNumberSets[round % 2][writer])};
     if (writer < 8)
-        return {true, true, std::to_string(1000 + round * kWriters + writer)};
+        return {false, true, std::to_string(kNumberSets[(round + 1) % 2][writer - 4])};
     if (writer < 12)
         return {false, true, std::to_string(5000 + round * kWriters + writer)};
     if (writer < 17)
@@ -78,12 +85,11 @@ const std::string kUntouched =
 // The lists the store starts with: entries nobody touches around the ones the rounds remove.
 std::vector<std::string> InitialNumbers() {
     std::vector<std::string> numbers{"3"};
+    for (const int number : kNumberSets[1])  // the first round un-ignores these
+        numbers.push_back(std::to_string(number));
     for (int round = 0; round < kRounds; ++round) {
-        for (int writer = 0; writer < kWriters; ++writer) {
-            const Change change = ChangeOf(round, writer);
-            if (!change.ignore && change.messageNumber)
-                numbers.push_back(change.entry);
-        }
+        for (int writer = 8; writer < 12; ++writer)
+            numbers.push_back(ChangeOf(round, writer).entry);
         if (round % 10 == 5)
             numbers.push_back(std::to_string(100 + round));
     }

@@ -2,6 +2,7 @@
 // folder with its own settings store, window settings file, temporary folder and clock.
 #include <QAbstractButton>
 #include <QApplication>
+#include <QClipboard>
 #include <QGroupBox>
 #include <QHeaderView>
 #include <QLabel>
@@ -9,12 +10,16 @@
 #include <QMenu>
 #include <QMimeData>
 #include <QPlainTextEdit>
+#include <QProcess>
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
+#include <QScopeGuard>
+#include <QSettings>
 #include <QSignalSpy>
 #include <QTabWidget>
 #include <QTextBlock>
+#include <QTextBrowser>
 #include <QTreeWidget>
 #include <QtTest>
 #include <filesystem>
@@ -25,6 +30,7 @@
 #include "ChmWriter.h"
 #include "HelpViewer.h"
 #include "UiTestMain.h"
+#include "VtrVersion.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
@@ -54,6 +60,8 @@ class RecordingPresenter : public vtr::DialogPresenter {
     };
     QList<Box> boxes;
     QList<FileDialogRequest> requests;
+    QStringList foldersOpened;
+    bool folderOpens = true;
     std::function<std::optional<QString>(const FileDialogRequest&)> answer;
 
     void ShowError(QWidget*, const QString& title, const QString& text) override {
@@ -62,6 +70,10 @@ class RecordingPresenter : public vtr::DialogPresenter {
     std::optional<QString> ChooseFile(QWidget*, const FileDialogRequest& request) override {
         requests.append(request);
         return answer ? answer(request) : std::nullopt;
+    }
+    bool OpenFolder(QWidget*, const QString& folder) override {
+        foldersOpened.append(folder);
+        return folderOpens;
     }
 };
 
@@ -121,6 +133,27 @@ QPoint OnItem(const QTreeWidget* list, QTreeWidgetItem* item) {
     return QPoint(rect.left() + 20, rect.center().y());
 }
 
+// A right click on an item through the window system, as a user's: the press reaches the
+// window, which opens the context menu at the pointer.
+QPoint RightClick(QTreeWidget* list, QTreeWidgetItem* item) {
+    const QPoint at = OnItem(list, item);
+    QWidget* window = list->window();
+    QTest::mouseClick(window->windowHandle(), Qt::RightButton, {},
+                      list->viewport()->mapTo(window, at));
+    return list->viewport()->mapToGlobal(at);
+}
+
+// A click on a menu's entry, where it is shown.
+void ClickMenuEntry(QMenu* menu, const QString& text) {
+    for (QAction* action : menu->actions()) {
+        if (action->text() == text) {
+            QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(action).center());
+            return;
+        }
+    }
+    QFAIL(qPrintable(QStringLiteral("no menu entry ") + text));
+}
+
 // A double-click on an item, as the system delivers it: press, release, then the double
 // click itself.
 void DoubleClick(QTreeWidget* list, QTreeWidgetItem* item) {
@@ -162,6 +195,14 @@ class FrmVerifierTest : public QObject {
     void placementAndTargetAreRemembered();
     void aDroppedFileBecomesTheTarget();
     void keyboardReachesTheCommands();
+    void popupActsOnTheRowUnderThePointer();
+    void countersFollowIgnoring();
+    void relativeTargetsBecomeAbsolute();
+    void aCancelledRunSaysSo();
+    void versionAndHelpNeedNoDisplay();
+    void logColoursSuitThePalette();
+    void stopIgnoringFromTheIgnoredList();
+    void detailsPaneShowsTheSelectedResultWhole();
 
   private:
     template <typename T>
@@ -331,12 +372,15 @@ void FrmVerifierTest::loadsWithEveryControlAndBegins() {
     QCOMPARE(Find<QPushButton>("cmdCancel")->text(), QStringLiteral("&Cancel"));
     QCOMPARE(Find<QPushButton>("cmdVerify")->text(), QStringLiteral("&Verify"));
 
+    // The pop-up menu's entries, the result's own first; then Copy.
     const QList<QAction*> popup = Find<QMenu>("mnuResultPopup")->actions();
-    QCOMPARE(popup.size(), 4);
+    QCOMPARE(popup.size(), 6);
     QCOMPARE(popup[0]->text(), QStringLiteral("Help on this result"));
     QVERIFY(popup[1]->isSeparator());
     QCOMPARE(popup[2]->text(), QStringLiteral("Ignore this result"));
     QCOMPARE(popup[3]->text(), QStringLiteral("Ignore all results with this message number"));
+    QVERIFY(popup[4]->isSeparator());
+    QCOMPARE(popup[5]->text(), QStringLiteral("Copy"));
     ExpectIdle();
 
     // Loaded: registered with the driver, and BeginVerification ran once, queueing the three
@@ -601,11 +645,11 @@ void FrmVerifierTest::ignoringMovesTheListedResults() {
     auto* menu = Find<QMenu>("mnuResultPopup");
 
     // Right click on B, "Ignore this result": B moves at once.
-    const QPoint onB = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, b)));
-    emit results->customContextMenuRequested(onB);
-    QVERIFY(menu->isVisible());
-    menu->actions()[2]->trigger();
-    menu->hide();
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    RightClick(results, ItemOf(results, b));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore this result"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Six C"),
                                               QStringLiteral("Five D")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B")}));
@@ -614,10 +658,10 @@ void FrmVerifierTest::ignoringMovesTheListedResults() {
 
     // "Ignore all results with this message number" on A: the other fives follow, and the
     // ignored list keeps the order in which the results were produced.
-    const QPoint onA = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, a)));
-    emit results->customContextMenuRequested(onA);
-    menu->actions()[3]->trigger();
-    menu->hide();
+    RightClick(results, ItemOf(results, a));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore all results with this message number"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Six C")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
                                               QStringLiteral("Five D")}));
@@ -815,10 +859,10 @@ void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
     // does not map opens the verifier's page.
     tabs->setCurrentIndex(frmVerifier::ResultsTab);
     auto* menu = Find<QMenu>("mnuResultPopup");
-    emit Results()->customContextMenuRequested(
-        Results()->viewport()->mapTo(Results(), OnItem(Results(), ItemOf(Results(), conflict))));
-    menu->actions()[0]->trigger();
-    menu->hide();
+    RightClick(Results(), ItemOf(Results(), conflict));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Help on this result"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
     window_->OpenResult(other);
     QCOMPARE(viewerPage(), QStringLiteral("/Verifier.htm"));
@@ -841,17 +885,21 @@ void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
 }
 
 void FrmVerifierTest::placementAndTargetAreRemembered() {
+    const QString show =
+        QDir::toNativeSeparators(QString::fromStdString(folder_->File("Main.lss")));
+    const QString sequence =
+        QDir::toNativeSeparators(QString::fromStdString(folder_->File("Carol.lms")));
     window_->resize(777, 555);
     Find<QRadioButton>("optTargetShow")->setChecked(true);
-    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("/shows/Main.lss"));
-    Find<QLineEdit>("txtTargetSequence")->setText(QStringLiteral("/seq/Carol.lms"));
+    Find<QLineEdit>("txtTargetShow")->setText(show);
+    Find<QLineEdit>("txtTargetSequence")->setText(sequence);
     QVERIFY(window_->close());
 
     window_ = MakeWindow();
     QCOMPARE(window_->size(), QSize(777, 555));
     QVERIFY(Find<QRadioButton>("optTargetShow")->isChecked());
-    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), QStringLiteral("/shows/Main.lss"));
-    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), QStringLiteral("/seq/Carol.lms"));
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), show);
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), sequence);
     // Kept in the window's own file, never in the suite's settings store.
     QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg")), storeText_);
 }
@@ -918,6 +966,417 @@ void FrmVerifierTest::keyboardReachesTheCommands() {
     auto* menu = Find<QMenu>("mnuResultPopup");
     QTRY_VERIFY(menu->isVisible());
     menu->hide();
+}
+
+void FrmVerifierTest::popupActsOnTheRowUnderThePointer() {
+    const ResultPtr error =
+        LibVerify::AddResult(Severity::Error, "Show file does not exist", 21, 21, {"a.lss"});
+    const ResultPtr first = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr second = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    QTreeWidget* results = Results();
+    // The user had selected the error, then right-clicks the second warning.
+    QTest::mouseClick(results->viewport(), Qt::LeftButton, {},
+                      OnItem(results, ItemOf(results, error)));
+    QCOMPARE(results->currentItem(), ItemOf(results, error));
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    const QPoint pointer = RightClick(results, ItemOf(results, second));
+    QTRY_VERIFY(menu->isVisible());
+    // The menu opens at the pointer, on the row under it, which becomes the selected one.
+    QCOMPARE(menu->pos(), pointer);
+    QCOMPARE(results->currentItem(), ItemOf(results, second));
+    ClickMenuEntry(menu, QStringLiteral("Ignore this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(results),
+             (QStringList{QStringLiteral("Show file does not exist"), QStringLiteral("Five A")}));
+    QCOMPARE(ListTexts(Ignored()), (QStringList{QStringLiteral("Five B")}));
+    const std::string store = vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"));
+    QVERIFY(store.find("\"IgnoreMsg1\"=\"5-B / \"") != std::string::npos);
+    QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
+
+    // The same on the first row, right under the header.
+    RightClick(results, ItemOf(results, error));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore all results with this message number"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A")}));
+    QVERIFY(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"))
+                .find("\"IgnoreMsgNum1\"=\"21\"") != std::string::npos);
+    Q_UNUSED(first);
+}
+
+void FrmVerifierTest::countersFollowIgnoring() {
+    const ResultPtr e1 = LibVerify::AddResult(Severity::Error, "Error one", 21, 21, {"1"});
+    const ResultPtr e2 = LibVerify::AddResult(Severity::Error, "Error two", 21, 21, {"2"});
+    const ResultPtr e3 = LibVerify::AddResult(Severity::Error, "Error three", 22, 22, {"3"});
+    const ResultPtr w1 = LibVerify::AddResult(Severity::Warning, "Warning one", 5, 5, {"4"});
+    const ResultPtr w2 = LibVerify::AddResult(Severity::Warning, "Warning two", 5, 5, {"5"});
+    LibVerify::AddResult(Severity::Info, "Info", 1, 1);
+    auto errors = [this] { return Find<QLabel>("lblErrorsCount")->text(); };
+    auto warnings = [this] { return Find<QLabel>("lblWarningsCount")->text(); };
+    QCOMPARE(errors(), QStringLiteral("3"));
+    QCOMPARE(warnings(), QStringLiteral("2"));
+
+    window_->IgnoreResult(e2);
+    QCOMPARE(errors(), QStringLiteral("2"));
+    QCOMPARE(warnings(), QStringLiteral("2"));
+    window_->IgnoreMessageNumber(w1);
+    QCOMPARE(errors(), QStringLiteral("2"));
+    QCOMPARE(warnings(), QStringLiteral("0"));
+    window_->IgnoreMessageNumber(e1);  // e2 is ignored twice over now
+    QCOMPARE(errors(), QStringLiteral("1"));
+
+    vtr::IgnoreLists::UnignoreMessageNumber(5);
+    window_->RefreshIgnoredResults();
+    QCOMPARE(warnings(), QStringLiteral("2"));
+    vtr::IgnoreLists::UnignoreMessageNumber(21);
+    window_->RefreshIgnoredResults();
+    QCOMPARE(errors(), QStringLiteral("2"));  // e1 back; e2 still ignored on its own
+    QCOMPARE(Results()->topLevelItemCount(), 5);
+    Q_UNUSED(e3);
+    Q_UNUSED(w2);
+}
+
+void FrmVerifierTest::relativeTargetsBecomeAbsolute() {
+    // The working folder is the test's; the target is named relative to it.
+    const QString previous = QDir::currentPath();
+    QVERIFY(QDir::setCurrent(QString::fromStdString(folder_->Path())));
+    auto restore = qScopeGuard([&] { QDir::setCurrent(previous); });
+    fs::create_directories(folder_->File("shows"));
+    const QString absoluteShow = QDir::toNativeSeparators(
+        QString::fromStdString(folder_->File("shows")) + QStringLiteral("/Missing.lss"));
+
+    // Typed.
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("shows/../shows/Missing.lss"));
+    Click("cmdVerify");
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), absoluteShow);
+    QVERIFY(
+        LogLines().contains(kStamp + QStringLiteral("Show file does not exist: ") + absoluteShow));
+
+    // Given on the command line (or dropped).
+    QVERIFY(window_->SetTargetFile(QStringLiteral("Intro.las")));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("Intro.las"))));
+
+    // Remembered: absolute, so that it holds wherever the window opens next.
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("Other.lss"));
+    QVERIFY(window_->close());
+    const QSettings settings(QString::fromStdString(folder_->File("window.ini")),
+                             QSettings::IniFormat);
+    QCOMPARE(settings.value(QStringLiteral("target/show")).toString(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("Other.lss"))));
+
+    // A relative one remembered by an older window is read against the working folder.
+    {
+        QSettings old(QString::fromStdString(folder_->File("window.ini")), QSettings::IniFormat);
+        old.setValue(QStringLiteral("target/sequence"), QStringLiteral("old/Carol.lms"));
+    }
+    window_ = MakeWindow();
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("old")) +
+                                      QStringLiteral("/Carol.lms")));
+}
+
+void FrmVerifierTest::aCancelledRunSaysSo() {
+    Watcher watcher;
+    watcher.onCompleted = [&](int completed) {
+        if (completed == 2)
+            QMetaObject::invokeMethod(Find<QPushButton>("cmdCancel"), "click",
+                                      Qt::QueuedConnection);
+    };
+    Click("cmdVerify");
+    auto* progress = Find<QProgressBar>("prgVerification");
+    QCOMPARE(progress->text(), QStringLiteral("Cancelled"));
+    // The bar stops where the run did, short of the checks that were dropped.
+    QCOMPARE(progress->value(), 2);
+    QVERIFY(progress->maximum() > 2);
+    QVERIFY(Find<QLabel>("lblStatus")->text().startsWith(QStringLiteral("Cancelled")));
+
+    // The next run counts checks again.
+    watcher.onCompleted = nullptr;
+    Click("cmdVerify");
+    QCOMPARE(progress->text(), QStringLiteral("%1 of %1 checks").arg(progress->maximum()));
+    QVERIFY(!Find<QLabel>("lblStatus")->text().startsWith(QStringLiteral("Cancelled")));
+}
+
+void FrmVerifierTest::versionAndHelpNeedNoDisplay() {
+    // A platform that cannot be had: the answers must come before any window system is asked.
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("no-such-platform"));
+    environment.remove(QStringLiteral("DISPLAY"));
+    environment.remove(QStringLiteral("WAYLAND_DISPLAY"));
+    environment.insert(QStringLiteral("QT_COMMAND_LINE_PARSER_NO_GUI_MESSAGE_BOXES"),
+                       QStringLiteral("1"));
+    auto run = [&](const QString& argument) {
+        QProcess program;
+        program.setProcessEnvironment(environment);
+        program.start(QStringLiteral(VTR_VERIFIER_PROGRAM), {argument});
+        program.waitForFinished(30000);
+        return std::make_pair(
+            program.exitStatus() == QProcess::NormalExit ? program.exitCode() : -1,
+            QString::fromLocal8Bit(program.readAllStandardOutput()));
+    };
+    const auto [versionStatus, version] = run(QStringLiteral("--version"));
+    QCOMPARE(versionStatus, 0);
+    QCOMPARE(version.trimmed(),
+             QStringLiteral("vantori-verifier ") + QString::fromLatin1(vtr::kVersionText));
+    const auto [helpStatus, help] = run(QStringLiteral("--help"));
+    QCOMPARE(helpStatus, 0);
+    QVERIFY(help.contains(QStringLiteral("--registry <FILE>")));
+    QVERIFY(help.contains(QStringLiteral("[TARGET]")));
+}
+
+void FrmVerifierTest::logColoursSuitThePalette() {
+    auto* log = Find<QPlainTextEdit>("rtxOutputLog");
+    // On a light page: the severities' own colours, and black.
+    LibVerify::AddResult(Severity::Info, "Info", 1, 1);
+    QCOMPARE(LogLineColour(0), QColor(0, 0, 255));
+    LibVerify::AddResult(Severity::Warning, "Warning", 5, 5);
+    QCOMPARE(LogLineColour(0), QColor(255, 128, 0));
+    LibVerify::AddResult(Severity::Error, "Error", 21, 21);
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+
+    // A dark palette: every line stays readable against the page, the earlier ones included.
+    QPalette dark;
+    dark.setColor(QPalette::Base, QColor(30, 30, 30));
+    dark.setColor(QPalette::Text, QColor(220, 220, 220));
+    dark.setColor(QPalette::Window, QColor(45, 45, 45));
+    dark.setColor(QPalette::WindowText, QColor(220, 220, 220));
+    window_->setPalette(dark);
+    LibVerify::PostTransientMessage("Loading sequence: 40%");
+    const QColor page = log->palette().color(QPalette::Base);
+    QCOMPARE(page, QColor(30, 30, 30));
+    auto readable = [&](const QColor& colour) {
+        return colour.lightnessF() - page.lightnessF() > 0.4;
+    };
+    QVERIFY(readable(LogLineColour(0)));  // the plain line
+    const QColor info = LogLineColour(3);
+    const QColor warning = LogLineColour(2);
+    const QColor error = LogLineColour(1);
+    for (const QColor& colour : {info, warning, error})
+        QVERIFY2(readable(colour), qPrintable(colour.name()));
+    // Still the same hues: blue, orange, red.
+    QVERIFY(info.blue() > info.red() && info.blue() > info.green());
+    QVERIFY(warning.red() > warning.green() && warning.green() > warning.blue());
+    QVERIFY(error.red() > error.green() && error.green() == error.blue());
+    LibVerify::AddResult(Severity::Error, "Error", 21, 21);
+    QCOMPARE(LogLineColour(0), error);
+
+    // Back to light: the severities' own colours again.
+    window_->setPalette(QPalette(QColor(240, 240, 240)));
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+    QCOMPARE(LogLineColour(4), QColor(0, 0, 255));
+}
+
+void FrmVerifierTest::stopIgnoringFromTheIgnoredList() {
+    const ResultPtr a = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr b = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    const ResultPtr c = LibVerify::AddResult(Severity::Error, "Six C", 6, 6, {"C"});
+    const ResultPtr d = LibVerify::AddResult(Severity::Warning, "Seven D", 7, 7, {"D"});
+    window_->IgnoreResult(b);
+    window_->IgnoreMessageNumber(c);
+    window_->IgnoreResult(d);
+    window_->IgnoreMessageNumber(d);  // D is ignored twice over
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTreeWidget* ignored = Ignored();
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B"), QStringLiteral("Six C"),
+                                              QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("0"));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("1"));
+
+    // The ignored list's menu offers the way back, for what each result is ignored by.
+    auto* menu = Find<QMenu>("mnuIgnoredPopup");
+    QStringList entries;
+    for (QAction* action : menu->actions())
+        entries.append(action->text());
+    QCOMPARE(entries, (QStringList{QStringLiteral("Help on this result"), QString(),
+                                   QStringLiteral("Stop ignoring this result"),
+                                   QStringLiteral("Stop ignoring all results with this message "
+                                                  "number"),
+                                   QString(), QStringLiteral("Copy")}));
+    auto* byKey = Find<QAction>("mnuStopIgnoringResult");
+    auto* byNumber = Find<QAction>("mnuStopIgnoringMessageNumber");
+    RightClick(ignored, ItemOf(ignored, c));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(!Find<QMenu>("mnuResultPopup")->isVisible());
+    QVERIFY(!byKey->isEnabled());
+    QVERIFY(byNumber->isEnabled());
+    menu->hide();
+    RightClick(ignored, ItemOf(ignored, d));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(byKey->isEnabled() && byNumber->isEnabled());
+    menu->hide();
+
+    // B, ignored on its own: back in its place at once, and the store changed exactly as the
+    // command line's unignore changes it.
+    const std::string storeFile = folder_->File("registry.reg");
+    const std::string cliStore = folder_->File("cli.reg");
+    fs::copy_file(storeFile, cliStore);
+    RightClick(ignored, ItemOf(ignored, b));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Stop ignoring this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("2"));
+    QProcess cli;
+    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
+              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
+               QStringLiteral("unignore"), QStringLiteral("--key"), QStringLiteral("5-B / ")});
+    QVERIFY(cli.waitForFinished(30000));
+    QCOMPARE(cli.exitCode(), 0);
+    QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
+    const std::string store = vtr::testsupport::ReadFileBytes(storeFile);
+    QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
+    QVERIFY(store.find("\"IgnoreMsg1\"=\"7-D / \"") != std::string::npos);
+
+    // C, ignored by its message number: the keyboard's Shift+Delete.
+    ignored->setFocus();
+    ignored->setCurrentItem(ItemOf(ignored, c));
+    QTest::keyClick(ignored, Qt::Key_Delete, Qt::ShiftModifier);
+    QCOMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                                                QStringLiteral("Six C")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("1"));
+    QVERIFY(vtr::testsupport::ReadFileBytes(storeFile).find(
+                "\"CountIgnoreMsgNum\"=dword:00000001") != std::string::npos);
+
+    // D, ignored twice over, stays ignored until both entries are gone.
+    window_->StopIgnoringResult(d);
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Seven D")}));
+    window_->StopIgnoringMessageNumber(d);
+    QVERIFY(ListTexts(ignored).isEmpty());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                          QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("3"));
+    QVERIFY(dialogs_->boxes.isEmpty());
+    Q_UNUSED(a);
+}
+
+// Where a link of a text browser is shown, in its viewport: the occurrence of its text whose
+// target is href.
+QPoint LinkPosition(QTextBrowser* browser, const QString& text, const QString& href) {
+    QTextCursor found(browser->document());
+    while (!(found = browser->document()->find(text, found)).isNull()) {
+        QTextCursor inside(browser->document());
+        inside.setPosition(found.selectionStart() + 2);
+        if (inside.charFormat().anchorHref() == href)
+            return browser->cursorRect(inside).center();
+    }
+    return {-1, -1};
+}
+
+void FrmVerifierTest::detailsPaneShowsTheSelectedResultWhole() {
+    fs::create_directories(DataFolder() + "/sequences");
+    vtr::testsupport::WriteFileBytes(DataFolder() + "/sequences/Glow.las", "");
+    const QString data = QDir::toNativeSeparators(QString::fromStdString(DataFolder()));
+    const QString sequences = data + QDir::separator() + QStringLiteral("sequences");
+    const std::string show = DataFolder() + "/Show0.lss";  // missing, in a folder that is there
+    const std::string glow = DataFolder() + "/sequences/Glow.las";
+    const std::string elsewhere = folder_->File("no such folder") + "/Gone.las";
+    const ResultPtr conflict =
+        LibVerify::AddResult(Severity::Warning, "Channel conflict", 43, 43,
+                             {"[SHOW]: " + show, "[SECTION]: Background", "[SEQUENCE]: " + glow,
+                              "[APPLICATION]: " + AppFolder(), "[FILE]: " + elsewhere});
+    const ResultPtr bare = LibVerify::AddResult(Severity::Error, "Bare", 3, 3);
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    auto* pane = Find<QFrame>("frameResultDetails");
+    // The log tab has no result to show.
+    QVERIFY(!pane->isVisible());
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QVERIFY(pane->isVisible());
+    QTRY_VERIFY(Find<QLabel>("lblResultHelp")->height() > 0);  // laid out
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Select a result to see it whole here."));
+    QVERIFY(!Find<QPushButton>("cmdCopyResult")->isEnabled());
+
+    // A click on a result shows it whole.
+    QTest::mouseClick(Results()->viewport(), Qt::LeftButton, {},
+                      OnItem(Results(), ItemOf(Results(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Channel conflict"));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(), QStringLiteral("Warning, message number 43"));
+    auto* details = Find<QTextBrowser>("txtResultDetails");
+    const QString link = QStringLiteral("Open containing folder");
+    const QString links = QStringLiteral("   ") + link;
+    QCOMPARE(details->toPlainText().split(QLatin1Char('\n')),
+             (QStringList{QString::fromStdString("[SHOW]: " + show) + links,
+                          QStringLiteral("[SECTION]: Background"),
+                          QString::fromStdString("[SEQUENCE]: " + glow) + links,
+                          QString::fromStdString("[APPLICATION]: " + AppFolder()) + links,
+                          QString::fromStdString("[FILE]: " + elsewhere)}));
+    QVERIFY(details->textInteractionFlags() & Qt::TextSelectableByMouse);
+
+    // "Open containing folder" beside the sequence: the folder that holds it; beside the
+    // application folder: that folder.
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:3")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:0")));
+    QCOMPARE(
+        dialogs_->foldersOpened,
+        (QStringList{sequences,
+                     QDir::toNativeSeparators(QDir::cleanPath(QString::fromStdString(AppFolder()))),
+                     data}));
+    // A folder the desktop cannot show: a message box says so.
+    dialogs_->folderOpens = false;
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QCOMPARE(
+        dialogs_->boxes,
+        (QList<RecordingPresenter::Box>{{QStringLiteral("Error Opening Folder"),
+                                         QStringLiteral("Cannot open the folder ") + sequences}}));
+    dialogs_->boxes.clear();
+
+    // Copy: the whole result as text, as the report has it.
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    const QString expected = QString::fromStdString(
+        "Message Number: 43\nSeverity: Warning\nDescription: Channel conflict\n"
+        "Detail #1: [SHOW]: " +
+        show +
+        "\nDetail #2: [SECTION]: Background\n"
+        "Detail #3: [SEQUENCE]: " +
+        glow + "\nDetail #4: [APPLICATION]: " + AppFolder() + "\nDetail #5: [FILE]: " + elsewhere +
+        "\n");
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+    // Ctrl+C in the list copies the selected result too.
+    QApplication::clipboard()->clear();
+    Results()->setFocus();
+    QTest::keyClick(Results(), Qt::Key_C, Qt::ControlModifier);
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+
+    // The help link: the result's topic (here the help file is missing, so its error).
+    auto* help = Find<QLabel>("lblResultHelp");
+    QTest::mouseClick(help, Qt::LeftButton, {}, QPoint(8, help->height() / 2));
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Help Context Error"));
+
+    // A result without details; then an ignored one says why it is ignored.
+    QTest::keyClick(Results(), Qt::Key_Down);
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Bare"));
+    QCOMPARE(details->toPlainText(), QStringLiteral("This result has no details."));
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    QCOMPARE(QApplication::clipboard()->text(),
+             QStringLiteral("Message Number: 3\nSeverity: Error\nDescription: Bare\n"));
+    window_->IgnoreMessageNumber(conflict);
+    window_->IgnoreResult(conflict);
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTest::mouseClick(Ignored()->viewport(), Qt::LeftButton, {},
+                      OnItem(Ignored(), ItemOf(Ignored(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: this result, and all results "
+                            "with message number 43)"));
+    window_->StopIgnoringResult(conflict);
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: all results with message "
+                            "number 43)"));
 }
 
 VTR_UI_TEST_MAIN(FrmVerifierTest)
