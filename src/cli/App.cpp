@@ -19,9 +19,9 @@
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
 #include "engine/VtrError.h"
+#include "environment/OutputFile.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
-#include "show/WholeFile.h"
 
 namespace vtr::cli {
 namespace {
@@ -101,24 +101,19 @@ class ScopedEventPump {
     ScopedEventPump& operator=(const ScopedEventPump&) = delete;
 };
 
-bool SameFile(const std::string& a, const std::string& b) {
-    std::error_code error;
-    return !a.empty() && !b.empty() && fs::equivalent(fs::path(a), fs::path(b), error) && !error;
-}
+// The temporary files of the selected target go with the run, however it ends: normally,
+// cancelled, or by an error escaping (at the program's end the driver's state removes them
+// too, and a second Ctrl-C removes them in its handler).
+class TempFilesRemover {
+  public:
+    TempFilesRemover() = default;
+    ~TempFilesRemover() { LibVerify::DeleteTempFiles(); }
+    TempFilesRemover(const TempFilesRemover&) = delete;
+    TempFilesRemover& operator=(const TempFilesRemover&) = delete;
+};
 
-// What the run must not overwrite with its report: the target and the settings store.
-std::vector<std::string> ProtectedFiles(const Options& options) {
-    std::vector<std::string> files;
-    if (options.target == TargetKind::Schedule) {
-        files.push_back(VTRCommon::GetWeeklyScheduleFile());
-        files.push_back(VTRCommon::GetYearlyScheduleFile());
-    } else {
-        files.push_back(options.targetFile);
-    }
-    if (auto store = RegistryStore::CurrentFile())
-        files.push_back(*store);
-    return files;
-}
+constexpr const char* kReportWhat = "results file";
+constexpr const char* kReportSource = "vantori-verify";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -138,11 +133,6 @@ std::string SetUpProblem(const Options& options) {
         if (!fs::is_directory(folder, error))
             return "cannot write the results report " + *options.output +
                    ": its folder does not exist";
-        for (const std::string& file : ProtectedFiles(options)) {
-            if (SameFile(*options.output, file))
-                return "the results report " + *options.output +
-                       " would overwrite a file of the suite";
-        }
     }
     return {};
 }
@@ -206,13 +196,20 @@ int RunVerify(const Options& givenOptions, Console& console) {
     if (options.log)
         logging = std::make_unique<ScopedClient>(&logWriter);
 
-    // Ctrl-C from here on only asks for a cancellation, which the pump passes on between two
-    // steps of the run; the driver then removes its temporary files as at any other end.
+    // Ctrl-C (and SIGTERM, a hang-up, a closed output) from here on only asks for a
+    // cancellation, which the pump passes on as soon as it runs: between two checks, and
+    // inside long checks and sequence loads as they report progress. The driver then removes
+    // its temporary files as at any other end; a second Ctrl-C removes them and ends at once.
     auto interrupts = std::make_unique<InterruptGuard>();
     bool cancelRequested = false;
     ScopedEventPump pump([&] {
-        if (InterruptGuard::Requested() && !cancelRequested && LibVerify::IsVerifying()) {
+        const Interruption interruption = InterruptGuard::Requested();
+        if (interruption != Interruption::None && !cancelRequested && LibVerify::IsVerifying()) {
             cancelRequested = true;
+            if (progress)
+                progress->Erase();
+            Fail(console.err, CancellingNotice(interruption));
+            console.err.flush();
             LibVerify::CancelVerification();
         }
         if (progress) {
@@ -222,8 +219,12 @@ int RunVerify(const Options& givenOptions, Console& console) {
         }
     });
 
+    TempFilesRemover removeTempFiles;
     try {
         SelectTarget(options);
+        // The report would replace the target or the store: said before the run, not after.
+        if (options.output)
+            OutputFile::RefuseInput(*options.output, kReportWhat, kReportSource);
     } catch (const VtrError& error) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
@@ -250,12 +251,15 @@ int RunVerify(const Options& givenOptions, Console& console) {
     presentation.color = UseColor(options.color, console.outIsColorTerminal);
     presentation.baselineFile = options.baseline;
 
-    int status = ExitStatusOf(record, options.failOn);
+    // A cancelled run found less than there is: whatever it found, it is not a result.
+    int status = record.cancelled ? ExitStatus::Cancelled : ExitStatusOf(record, options.failOn);
     if (options.output) {
+        // Never over a file the run read or checked (the report writer refuses it), and
+        // whole or not at all.
         try {
             SaveReport(*options.output, record, presentation);
         } catch (const VtrError& error) {
-            Fail(console.err, "Error Saving Verifier Messages: " + error.Description());
+            Fail(console.err, error.Description());
             status = ExitStatus::CannotSetUp;
         }
     }
@@ -263,10 +267,11 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, "the baseline " + *options.writeBaseline +
                               " was not written: the verification was cancelled");
     } else if (options.writeBaseline) {
-        const int32_t failure = WriteWholeFile(*options.writeBaseline, Baseline::TextOf(record));
-        if (failure != 0) {
-            Fail(console.err, "cannot write the baseline " + *options.writeBaseline + ": " +
-                                  FileErrorDescription(failure));
+        try {
+            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), "baseline",
+                              kReportSource);
+        } catch (const VtrError& error) {
+            Fail(console.err, error.Description());
             status = ExitStatus::CannotSetUp;
         }
     }

@@ -28,6 +28,7 @@ inline constexpr int Warnings = 1;     // warnings, no errors
 inline constexpr int Errors = 2;       // errors
 inline constexpr int CannotSetUp = 3;  // the target (or the settings store) cannot be set up
 inline constexpr int Usage = 64;       // wrong usage
+inline constexpr int Cancelled = 130;  // cancelled (Ctrl-C, SIGTERM, a hang-up), whatever found
 inline constexpr int Internal = 70;    // an unexpected failure of the program itself
 }  // namespace ExitStatus
 

@@ -5,7 +5,7 @@
 
 #include "engine/ResultsReport.h"
 #include "engine/VtrError.h"
-#include "show/WholeFile.h"
+#include "environment/OutputFile.h"
 
 namespace vtr::cli {
 
@@ -29,8 +29,7 @@ void SaveReport(const std::string& path, const RunRecord& record,
             plain.color = false;
             std::ostringstream document;
             WriteJson(document, record, plain);
-            if (const int32_t failure = WriteWholeFile(path, document.str()); failure != 0)
-                Raise(failure, "vantori-verify", FileErrorDescription(failure));
+            OutputFile::Write(path, document.str(), "results file", "vantori-verify");
             return;
         }
     }

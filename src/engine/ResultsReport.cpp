@@ -1,13 +1,9 @@
 #include "engine/ResultsReport.h"
 
-#include <cerrno>
-#include <cstdio>
-#include <system_error>
-
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
+#include "environment/OutputFile.h"
 #include "environment/VTRCommon.h"
-#include "show/WholeFile.h"
 
 namespace vtr::ResultsReport {
 
@@ -29,10 +25,6 @@ std::string ReportText() {
     return text;
 }
 
-std::string SystemText(int error) {
-    return std::generic_category().message(error);
-}
-
 }  // namespace
 
 std::string ResultText(const Result& result, std::string_view lineEnd) {
@@ -52,33 +44,7 @@ std::string ResultText(const Result& result, std::string_view lineEnd) {
 }
 
 void SaveResultsReport(const std::string& fileName) {
-    std::FILE* file = nullptr;
-    try {
-        const std::string text = ReportText();
-        file = std::fopen(fileName.c_str(), "wb");
-        if (file == nullptr) {
-            Raise(FileErrors::PathFileAccessError, kSource,
-                  "Cannot create the results file " + fileName + ": " + SystemText(errno));
-        }
-        errno = 0;
-        if (std::fwrite(text.data(), 1, text.size(), file) != text.size() ||
-            std::fflush(file) != 0) {
-            Raise(FileErrors::DeviceIoError, kSource,
-                  "Cannot write the results file " + fileName + ": " +
-                      SystemText(errno != 0 ? errno : EIO));
-        }
-        std::FILE* closing = file;
-        file = nullptr;
-        if (std::fclose(closing) != 0) {
-            Raise(FileErrors::DeviceIoError, kSource,
-                  "Cannot write the results file " + fileName + ": " +
-                      SystemText(errno != 0 ? errno : EIO));
-        }
-    } catch (...) {
-        if (file != nullptr)
-            std::fclose(file);
-        throw;
-    }
+    OutputFile::Write(fileName, ReportText(), "results file", kSource);
 }
 
 DialogSettings ChooseResultsReportFileSettings() {
