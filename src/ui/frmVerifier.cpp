@@ -4,6 +4,7 @@
 #include <QApplication>
 #include <QClipboard>
 #include <QCloseEvent>
+#include <QComboBox>
 #include <QCursor>
 #include <QDir>
 #include <QDragEnterEvent>
@@ -29,12 +30,14 @@
 #include <QTabWidget>
 #include <QTextBlock>
 #include <QTimer>
-#include <QTreeWidget>
+#include <QToolButton>
 #include <QVBoxLayout>
 #include <algorithm>
 #include <exception>
 
 #include "ResultDetailsPane.h"
+#include "ResultsModel.h"
+#include "ResultsView.h"
 #include "UiText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
@@ -68,45 +71,8 @@ const QString kTargetKindKey = QStringLiteral("target/kind");
 const QString kTargetSequenceKey = QStringLiteral("target/sequence");
 const QString kTargetShowKey = QStringLiteral("target/show");
 
-constexpr int kDetailColumns = 9;
-
 // The progress bar's text while a run goes and after it completed.
 const QString kProgressFormat = QStringLiteral("%v of %m checks");
-
-// A list item: the result it shows (its tag) and the order in which results were listed,
-// so that a result moved between the lists lands where it was produced.
-class ResultItem : public QTreeWidgetItem {
-  public:
-    ResultItem(ResultPtr result, qint64 order)
-        : QTreeWidgetItem(UserType), result_(std::move(result)), order_(order) {}
-
-    const ResultPtr& Result() const { return result_; }
-    qint64 Order() const { return order_; }
-
-    // Sorting by a column: severity and message number by value, the texts as the user's
-    // language orders them; equal values keep the order in which they were produced.
-    bool operator<(const QTreeWidgetItem& other) const override {
-        const auto* that = dynamic_cast<const ResultItem*>(&other);
-        if (that == nullptr)
-            return QTreeWidgetItem::operator<(other);
-        const int column = treeWidget() != nullptr ? treeWidget()->sortColumn() : -1;
-        int compared = 0;
-        if (column == frmVerifier::SeverityColumn) {
-            compared =
-                static_cast<int>(result_->Severity()) - static_cast<int>(that->result_->Severity());
-        } else if (column == frmVerifier::MsgNumColumn) {
-            compared = (result_->MessageNumber() > that->result_->MessageNumber()) -
-                       (result_->MessageNumber() < that->result_->MessageNumber());
-        } else if (column >= 0) {
-            compared = QString::localeAwareCompare(text(column), other.text(column));
-        }
-        return compared != 0 ? compared < 0 : order_ < that->order_;
-    }
-
-  private:
-    ResultPtr result_;
-    qint64 order_;
-};
 
 // What a file is as a target, by its extension.
 enum class TargetKind { None, Sequence, Show };
@@ -241,20 +207,18 @@ void frmVerifier::PumpEvents() {
     }
     // During a run the core calls this after every check and result, thousands of times
     // on a large schedule. Input is handled every time, so a click on Cancel is seen at
-    // once; the summary is brought up to date and the window drawn at most every
-    // kRepaintIntervalMs, since laying out and drawing the window costs far more than a
-    // check.
+    // once; what the run changes on screen (the log, the lists, the summary) changes at
+    // most every kRepaintIntervalMs, since laying out and drawing costs far more than a
+    // check: in between, handling events finds nothing to draw.
     if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
         repaintClock_.restart();
         FlushLog();
+        TakeNewResults(false);
         if (summaryPending_)
             RefreshSummary();
         lblStatus_->setText(statusText_);
-        setUpdatesEnabled(true);
     }
     QCoreApplication::processEvents();
-    if (running_)
-        setUpdatesEnabled(false);
 }
 
 void frmVerifier::BuildControls() {
@@ -321,8 +285,8 @@ void frmVerifier::BuildControls() {
     // The lines' colours follow the palette: chosen again whenever it changes.
     rtxOutputLog_->installEventFilter(this);
     imlSeverity_ = new SeverityImageList(this);
-    lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"));
-    lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"));
+    lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"), Listing::NotIgnored);
+    lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"), Listing::Ignored);
     sstDetails_->addTab(rtxOutputLog_, QStringLiteral("Output Log"));
     sstDetails_->addTab(lvResults_[0], QStringLiteral("Results"));
     sstDetails_->addTab(lvResults_[1], QStringLiteral("Ignored Results"));
@@ -381,13 +345,22 @@ void frmVerifier::BuildControls() {
     fraResultDetails_ = new ResultDetailsPane(central);
     auto* splitter = new QSplitter(Qt::Vertical, central);
     splitter->setObjectName(QStringLiteral("splDetails"));
-    splitter->addWidget(sstDetails_);
+    auto* lists = new QWidget(splitter);
+    auto* listsLayout = new QVBoxLayout(lists);
+    listsLayout->setContentsMargins(0, 0, 0, 0);
+    listsLayout->setSpacing(4);
+    listsLayout->addWidget(BuildFindBar(lists));
+    listsLayout->addWidget(sstDetails_, 1);
+    splitter->addWidget(lists);
     splitter->addWidget(fraResultDetails_);
     splitter->setStretchFactor(0, 3);
     splitter->setStretchFactor(1, 1);
     splitter->setSizes({400, fontMetrics().height() * 12});
     splitter->setChildrenCollapsible(false);
-    connect(sstDetails_, &QTabWidget::currentChanged, this, [this] { ShowSelectedResult(); });
+    connect(sstDetails_, &QTabWidget::currentChanged, this, [this] {
+        ShowSelectedResult();
+        ShowCounts();
+    });
     connect(fraResultDetails_, &ResultDetailsPane::HelpRequested, this, &frmVerifier::HelpOnResult);
     connect(fraResultDetails_, &ResultDetailsPane::OpenFolderRequested, this,
             &frmVerifier::OpenFolder);
@@ -416,49 +389,52 @@ void frmVerifier::BuildControls() {
     ShowSelectedResult();
 }
 
-QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
-    auto* list = new QTreeWidget(sstDetails_);
+ResultsView* frmVerifier::BuildResultList(const QString& name, Listing listing) {
+    auto* model = new ResultsModel(
+        grouping_, listing,
+        [this](Severity severity) {
+            return imlSeverity_->Image(FromSuiteText(SeverityText(severity)));
+        },
+        this);
+    auto* list = new ResultsView(model, sstDetails_);
     list->setObjectName(name);
-    QStringList headers{QStringLiteral("Description"), QStringLiteral("Severity"),
-                        QStringLiteral("Msg Num")};
-    for (int i = 1; i <= kDetailColumns; ++i)
-        headers.append(QStringLiteral("Details%1").arg(i));
-    list->setColumnCount(static_cast<int>(headers.size()));
-    list->setHeaderLabels(headers);
-    list->setRootIsDecorated(false);
-    list->setUniformRowHeights(true);
-    list->setAlternatingRowColors(true);
-    list->setAllColumnsShowFocus(true);
-    list->setSelectionMode(QAbstractItemView::SingleSelection);
-    list->setSelectionBehavior(QAbstractItemView::SelectRows);
-    list->setContextMenuPolicy(Qt::CustomContextMenu);
-    list->header()->setStretchLastSection(false);
-    list->setColumnWidth(DescriptionColumn, 330);
-    list->setColumnWidth(SeverityColumn, 90);
-    list->setColumnWidth(MsgNumColumn, 70);
-    for (int i = 0; i < kDetailColumns; ++i)
-        list->setColumnWidth(Details1Column + i, 240);
-    // The results stay in the order produced until a column header is clicked.
-    list->header()->setSortIndicator(-1, Qt::AscendingOrder);
-    list->setSortingEnabled(true);
-
-    connect(list, &QTreeWidget::customContextMenuRequested, this,
-            [this, list](const QPoint& position) { ShowResultPopup(list, position); });
-    connect(list, &QTreeWidget::itemDoubleClicked, this,
-            [this](QTreeWidgetItem* item) { OpenResult(ResultOf(item)); });
-    connect(list, &QTreeWidget::currentItemChanged, this, [this] { ShowSelectedResult(); });
+    connect(list, &ResultsView::PopupRequested, this,
+            [this, list](const QModelIndex& index, const QPoint& at) {
+                ShowResultPopup(list, index, at);
+            });
+    connect(list, &QTreeView::doubleClicked, this, [this](const QModelIndex& index) {
+        // A group's row opens and closes; a result's opens its help.
+        if (const ResultPtr result = ResultOf(index))
+            OpenResult(result);
+    });
+    connect(list->selectionModel(), &QItemSelectionModel::currentChanged, this,
+            [this] { ShowSelectedResult(); });
+    connect(list->selectionModel(), &QItemSelectionModel::selectionChanged, this,
+            [this] { ShowSelectedResult(); });
+    // Clicking a column's header sorts by it, in place of errors first.
+    connect(list->header(), &QHeaderView::sortIndicatorChanged, this, [this](int column) {
+        if (column >= 0 && chkErrorsFirst_->isChecked())
+            chkErrorsFirst_->setChecked(false);
+    });
     auto* copy = new QShortcut(QKeySequence::Copy, list, nullptr, nullptr, Qt::WidgetShortcut);
     connect(copy, &QShortcut::activated, this, [this, list] { CopyResult(SelectedResult(list)); });
     auto* open =
         new QShortcut(QKeySequence(Qt::Key_Return), list, nullptr, nullptr, Qt::WidgetShortcut);
     auto* openEnter =
         new QShortcut(QKeySequence(Qt::Key_Enter), list, nullptr, nullptr, Qt::WidgetShortcut);
-    for (QShortcut* shortcut : {open, openEnter})
-        connect(shortcut, &QShortcut::activated, this,
-                [this, list] { OpenResult(SelectedResult(list)); });
+    for (QShortcut* shortcut : {open, openEnter}) {
+        connect(shortcut, &QShortcut::activated, this, [this, list] {
+            const QModelIndex current = list->currentIndex();
+            if (list->Model()->GroupAt(current) != nullptr) {
+                list->setExpanded(current, !list->isExpanded(current));
+            } else {
+                OpenResult(SelectedResult(list));
+            }
+        });
+    }
     // Delete ignores a result of the Results list, and stops ignoring one of the Ignored
     // Results list; with Shift, all results with its message number.
-    const bool ignoredList = name == QLatin1String("lvResults2");
+    const bool ignoredList = listing == Listing::Ignored;
     auto* ignore = new QShortcut(QKeySequence::Delete, list, nullptr, nullptr, Qt::WidgetShortcut);
     connect(ignore, &QShortcut::activated, this, [this, list, ignoredList] {
         if (ignoredList) {
@@ -477,6 +453,140 @@ QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
         }
     });
     return list;
+}
+
+QWidget* frmVerifier::BuildFindBar(QWidget* parent) {
+    auto* bar = new QWidget(parent);
+    bar->setObjectName(QStringLiteral("frameFind"));
+    auto* filterLabel = new QLabel(QStringLiteral("&Filter:"), bar);
+    txtFilter_ = new QLineEdit(bar);
+    txtFilter_->setObjectName(QStringLiteral("txtFilter"));
+    txtFilter_->setPlaceholderText(QStringLiteral("Text in the description or details (Ctrl+F)"));
+    txtFilter_->setClearButtonEnabled(true);
+    filterLabel->setBuddy(txtFilter_);
+    // Typing is followed once it pauses; Enter applies at once.
+    filterTimer_ = new QTimer(this);
+    filterTimer_->setSingleShot(true);
+    filterTimer_->setInterval(150);
+    connect(txtFilter_, &QLineEdit::textChanged, filterTimer_, qOverload<>(&QTimer::start));
+    connect(txtFilter_, &QLineEdit::returnPressed, this, &frmVerifier::ApplyQuery);
+    connect(filterTimer_, &QTimer::timeout, this, &frmVerifier::ApplyQuery);
+
+    auto toggle = [&](const char* name, const QString& text, const QString& tip) {
+        auto* button = new QToolButton(bar);
+        button->setObjectName(QString::fromLatin1(name));
+        button->setText(text);
+        button->setToolTip(tip);
+        button->setCheckable(true);
+        button->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
+        return button;
+    };
+    chkShowErrors_ =
+        toggle("chkShowErrors", QStringLiteral("Errors"), QStringLiteral("Show the errors"));
+    chkShowWarnings_ =
+        toggle("chkShowWarnings", QStringLiteral("Warnings"), QStringLiteral("Show the warnings"));
+    chkShowInfo_ = toggle("chkShowInfo", QStringLiteral("Info"),
+                          QStringLiteral("Show the information results"));
+    chkShowErrors_->setIcon(imlSeverity_->Image(QStringLiteral("Error")));
+    chkShowWarnings_->setIcon(imlSeverity_->Image(QStringLiteral("Warning")));
+    chkShowInfo_->setIcon(imlSeverity_->Image(QStringLiteral("Info")));
+    for (QToolButton* button : {chkShowErrors_, chkShowWarnings_, chkShowInfo_}) {
+        button->setChecked(true);
+        connect(button, &QToolButton::toggled, this, &frmVerifier::ApplyQuery);
+    }
+    chkErrorsFirst_ = toggle("chkErrorsFirst", QStringLiteral("Errors first"),
+                             QStringLiteral("Errors first, then warnings, then information; "
+                                            "otherwise in the order found (Ctrl+E)"));
+    chkErrorsFirst_->setShortcut(QKeySequence(Qt::CTRL | Qt::Key_E));
+    connect(chkErrorsFirst_, &QToolButton::toggled, this, [this](bool errorsFirst) {
+        // One order at a time: errors first, or a column's, or the order found.
+        if (errorsFirst) {
+            for (ResultsView* list : lvResults_)
+                list->header()->setSortIndicator(-1, Qt::AscendingOrder);
+        }
+        ApplyQuery();
+    });
+
+    auto* groupLabel = new QLabel(QStringLiteral("&Group by:"), bar);
+    cboGroupBy_ = new QComboBox(bar);
+    cboGroupBy_->setObjectName(QStringLiteral("cboGroupBy"));
+    cboGroupBy_->addItem(QStringLiteral("None"), static_cast<int>(GroupBy::None));
+    cboGroupBy_->addItem(QStringLiteral("Message"), static_cast<int>(GroupBy::Message));
+    cboGroupBy_->addItem(QStringLiteral("Show"), static_cast<int>(GroupBy::Show));
+    cboGroupBy_->addItem(QStringLiteral("Sequence"), static_cast<int>(GroupBy::Sequence));
+    cboGroupBy_->addItem(QStringLiteral("Sequence pair"), static_cast<int>(GroupBy::SequencePair));
+    cboGroupBy_->setToolTip(
+        QStringLiteral("Gather the results under their message, show, "
+                       "sequence, or the two sequences that conflict"));
+    groupLabel->setBuddy(cboGroupBy_);
+    connect(cboGroupBy_, &QComboBox::currentIndexChanged, this, &frmVerifier::ApplyQuery);
+
+    lblShown_ = new QLabel(bar);
+    lblShown_->setObjectName(QStringLiteral("lblShown"));
+
+    auto* layout = new QHBoxLayout(bar);
+    layout->setContentsMargins(0, 0, 0, 0);
+    layout->addWidget(filterLabel);
+    layout->addWidget(txtFilter_, 1);
+    layout->addWidget(chkShowErrors_);
+    layout->addWidget(chkShowWarnings_);
+    layout->addWidget(chkShowInfo_);
+    layout->addSpacing(8);
+    layout->addWidget(chkErrorsFirst_);
+    layout->addSpacing(8);
+    layout->addWidget(groupLabel);
+    layout->addWidget(cboGroupBy_);
+    layout->addSpacing(8);
+    layout->addWidget(lblShown_);
+
+    auto* find = new QShortcut(QKeySequence::Find, this);
+    connect(find, &QShortcut::activated, this, [this] {
+        txtFilter_->setFocus(Qt::ShortcutFocusReason);
+        txtFilter_->selectAll();
+    });
+    return bar;
+}
+
+ResultQuery frmVerifier::ChosenQuery() const {
+    ResultQuery query;
+    query.filter.text = ToSuiteText(txtFilter_->text().trimmed());
+    query.filter.errors = chkShowErrors_->isChecked();
+    query.filter.warnings = chkShowWarnings_->isChecked();
+    query.filter.info = chkShowInfo_->isChecked();
+    query.order = chkErrorsFirst_->isChecked() ? ResultOrder::ErrorsFirst : ResultOrder::RunOrder;
+    query.groupBy = static_cast<GroupBy>(cboGroupBy_->currentData().toInt());
+    return query;
+}
+
+void frmVerifier::ApplyQuery() {
+    filterTimer_->stop();
+    const ResultQuery query = ChosenQuery();
+    for (ResultsView* list : lvResults_) {
+        const ResultQuery& shown = list->Model()->Query();
+        if (shown.filter.text == query.filter.text && shown.filter.errors == query.filter.errors &&
+            shown.filter.warnings == query.filter.warnings &&
+            shown.filter.info == query.filter.info && shown.order == query.order &&
+            shown.groupBy == query.groupBy)
+            continue;
+        list->Model()->SetQuery(query);
+        // The selected result stays in view.
+        if (list->currentIndex().isValid())
+            list->scrollTo(list->currentIndex());
+    }
+    // What is being looked for is in the lists, not in the log.
+    if (sstDetails_->currentIndex() == OutputLogTab)
+        sstDetails_->setCurrentIndex(ResultsTab);
+    ShowCounts();
+}
+
+void frmVerifier::ShowCounts() {
+    const ResultsView* list = lvResults_[sstDetails_->currentIndex() == IgnoredResultsTab ? 1 : 0];
+    const ResultsModel* model = list->Model();
+    const std::size_t shown = model->ShownCount();
+    lblShown_->setText(
+        QStringLiteral("%1 of %2 shown")
+            .arg(FromSuiteText(FormatCount(static_cast<int64_t>(shown))))
+            .arg(FromSuiteText(FormatCount(static_cast<int64_t>(shown + model->HiddenCount())))));
 }
 
 void frmVerifier::BuildMenus() {
@@ -653,7 +763,7 @@ void frmVerifier::SetRunning(bool running) {
     running_ = running;
     if (!running) {
         FlushLog();
-        setUpdatesEnabled(true);
+        TakeNewResults(true);
         repaintClock_.invalidate();
         lblStatus_->setText(statusText_);
     }
@@ -694,10 +804,11 @@ void frmVerifier::RefreshSummary() {
     const int32_t remaining = LibVerify::ChecksRemainingCount();
     lblChecksPerformedCount_->setText(QString::number(performed));
     lblChecksRemainingCount_->setText(QString::number(remaining));
-    // The errors and warnings the Results list shows: the driver's counts until the user
-    // ignores or stops ignoring a result, the list's own from then on.
-    lblErrorsCount_->setText(QString::number(errorsListed_));
-    lblWarningsCount_->setText(QString::number(warningsListed_));
+    // The errors and warnings of the Results list (whatever its filter hides): as the
+    // driver counts them until the user ignores or stops ignoring a result.
+    const SeverityCounts listed = grouping_.Counts(Listing::NotIgnored);
+    lblErrorsCount_->setText(QString::number(listed.errors));
+    lblWarningsCount_->setText(QString::number(listed.warnings));
     // A cancelled run stops short of the checks it dropped, and says so.
     const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
@@ -829,20 +940,21 @@ void frmVerifier::ChecksCompleted(bool cancelled) {
 void frmVerifier::Initializing() {
     pendingLog_.clear();
     rtxOutputLog_->clear();
-    lvResults_[0]->clear();
-    lvResults_[1]->clear();
+    grouping_.Clear();
+    for (ResultsView* list : lvResults_)
+        list->Model()->Clear();
     popupResult_.reset();
     fraResultDetails_->ShowResult(nullptr);
-    resultsListed_ = 0;
-    errorsListed_ = 0;
-    warningsListed_ = 0;
+    ShowCounts();
     SetStatus(QString());
     sstDetails_->setCurrentIndex(OutputLogTab);
 }
 
 void frmVerifier::ResultAdded(const ResultPtr& result) {
-    QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
-    AddResultItem(list, result, resultsListed_++);
+    grouping_.Add(result, result->Ignorable());
+    // While a run goes, the lists take new results when the window is drawn.
+    if (!running_)
+        TakeNewResults(true);
     SummaryChanged();
     WriteLog(FromSuiteText(OutputLog::ResultText(*result)), static_cast<int>(result->Severity()));
     LibVerify::ProcessPendingEvents();
@@ -860,109 +972,80 @@ void frmVerifier::VerificationCancelled() {
 
 // --- The result lists ----------------------------------------------------------------------
 
-ResultPtr frmVerifier::ResultOf(const QTreeWidgetItem* item) {
-    const auto* resultItem = dynamic_cast<const ResultItem*>(item);
-    return resultItem != nullptr ? resultItem->Result() : nullptr;
+ResultPtr frmVerifier::ResultOf(const QModelIndex& index) {
+    const auto* model = qobject_cast<const ResultsModel*>(index.model());
+    return model != nullptr ? model->ResultAt(index) : nullptr;
 }
 
-void frmVerifier::AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order) {
-    auto* item = new ResultItem(result, order);
-    const QString severity = FromSuiteText(result->SeverityText());
-    item->setText(DescriptionColumn, FromSuiteText(result->Summary()));
-    item->setIcon(DescriptionColumn, imlSeverity_->Image(severity));
-    item->setText(SeverityColumn, severity);
-    item->setText(MsgNumColumn, QString::number(result->MessageNumber()));
-    QStringList details;
-    const std::vector<std::string>& resultDetails = result->Details();
-    for (std::size_t i = 0; i < resultDetails.size(); ++i) {
-        const QString detail = FromSuiteText(resultDetails[i]);
-        details.append(detail);
-        if (i < static_cast<std::size_t>(kDetailColumns))
-            item->setText(Details1Column + static_cast<int>(i), detail);
+void frmVerifier::TakeNewResults(bool now) {
+    // A list that is not on view and simply appends takes its new rows every time: that is
+    // cheap. A list on view lays all its rows out again whenever it gains some, and one that
+    // is grouped, ordered or sorted is rebuilt: while a run goes, those take new results at
+    // most every kRelayoutIntervalMs.
+    const bool due =
+        now || !relayoutClock_.isValid() || relayoutClock_.hasExpired(kRelayoutIntervalMs);
+    bool changed = false;
+    for (ResultsView* list : lvResults_) {
+        ResultsModel* model = list->Model();
+        if (due || (model->Appends() && !list->isVisible()))
+            changed = model->TakeNewResults() || changed;
     }
-    QString tip = item->text(DescriptionColumn);
-    if (!details.isEmpty())
-        tip += QLatin1Char('\n') + details.join(QLatin1Char('\n'));
-    item->setToolTip(DescriptionColumn, tip);
-    list->addTopLevelItem(item);
-    if (list == lvResults_[0])
-        CountListed(*result, 1);
+    if (due)
+        relayoutClock_.restart();
+    if (changed)
+        ShowCounts();
 }
 
-void frmVerifier::CountListed(const Result& result, int change) {
-    if (result.Severity() == Severity::Error) {
-        errorsListed_ += change;
-    } else if (result.Severity() == Severity::Warning) {
-        warningsListed_ += change;
-    }
-}
-
-void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item) {
-    auto* resultItem =
-        static_cast<ResultItem*>(from->takeTopLevelItem(from->indexOfTopLevelItem(item)));
-    if (resultItem == nullptr)
-        return;
-    // Unsorted lists keep the order produced: the item goes before the first one listed
-    // after it. A sorted list places it itself.
-    int index = to->topLevelItemCount();
-    if (to->sortColumn() < 0) {
-        for (int i = 0; i < to->topLevelItemCount(); ++i) {
-            const auto* other = static_cast<const ResultItem*>(to->topLevelItem(i));
-            if (other->Order() > resultItem->Order()) {
-                index = i;
-                break;
+void frmVerifier::RelayoutLists() {
+    for (ResultsView* list : lvResults_) {
+        // A result that leaves the list (ignored, say) hands the selection to the row that
+        // takes its place, so that the next one can be dealt with at once.
+        const QModelIndex current = list->currentIndex();
+        const int row = current.row();
+        const QPersistentModelIndex parent = current.parent();
+        list->Model()->Relayout();
+        if (current.isValid() && !list->currentIndex().isValid()) {
+            ResultsModel* model = list->Model();
+            const QModelIndex within = parent.isValid() ? QModelIndex(parent) : QModelIndex();
+            const int rows = model->rowCount(within);
+            if (rows > 0) {
+                const QModelIndex next = model->index(std::min(row, rows - 1), 0, within);
+                list->setCurrentIndex(next);
             }
         }
     }
-    to->insertTopLevelItem(index, resultItem);
-    CountListed(*resultItem->Result(), to == lvResults_[0] ? 1 : -1);
+    ShowCounts();
 }
 
 void frmVerifier::RefreshIgnoredResults() {
-    QTreeWidget* results = lvResults_[0];
-    QTreeWidget* ignored = lvResults_[1];
-    QList<QTreeWidgetItem*> toIgnored;
-    for (int i = 0; i < results->topLevelItemCount(); ++i) {
-        const ResultPtr result = ResultOf(results->topLevelItem(i));
-        if (result && result->Ignorable())
-            toIgnored.append(results->topLevelItem(i));
+    TakeNewResults(true);
+    bool moved = false;
+    for (std::size_t i = 0; i < grouping_.Size(); ++i) {
+        const bool ignored = grouping_.At(i)->Ignorable();
+        if (ignored != grouping_.Ignored(i)) {
+            grouping_.SetIgnored(i, ignored);
+            moved = true;
+        }
     }
-    QList<QTreeWidgetItem*> toResults;
-    for (int i = 0; i < ignored->topLevelItemCount(); ++i) {
-        const ResultPtr result = ResultOf(ignored->topLevelItem(i));
-        if (result && !result->Ignorable())
-            toResults.append(ignored->topLevelItem(i));
-    }
-    for (QTreeWidgetItem* item : toIgnored)
-        MoveItem(results, ignored, item);
-    for (QTreeWidgetItem* item : toResults)
-        MoveItem(ignored, results, item);
-    if (!toIgnored.isEmpty() || !toResults.isEmpty())
-        SummaryChanged();
+    if (!moved)
+        return;
+    RelayoutLists();
+    SummaryChanged();
 }
 
-ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
-    const QList<QTreeWidgetItem*> selected = list->selectedItems();
-    if (!selected.isEmpty())
-        return ResultOf(selected.constFirst());
-    return nullptr;
+ResultPtr frmVerifier::SelectedResult(const ResultsView* list) const {
+    const QModelIndex current = list->currentIndex();
+    if (!current.isValid() || !list->selectionModel()->isSelected(current))
+        return nullptr;
+    return ResultOf(current);
 }
 
-void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
-    // The position comes in the viewport's coordinates, as the list's items are laid out.
-    QTreeWidgetItem* item = list->itemAt(position);
-    QPoint at = position;
-    if (item == nullptr) {
-        // From the keyboard (the menu key): the current item.
-        item = list->currentItem();
-        if (item == nullptr)
-            return;
-        at = list->visualItemRect(item).bottomLeft();
-    }
-    list->setCurrentItem(item);
-    popupResult_ = ResultOf(item);
+void frmVerifier::ShowResultPopup(ResultsView* list, const QModelIndex& index,
+                                  const QPoint& globalPosition) {
+    popupResult_ = ResultOf(index);
     if (!popupResult_)
         return;
+    list->setCurrentIndex(index);
     QMenu* menu = mnuResultPopup_;
     if (list == lvResults_[1]) {
         // An ignored result is listed for its own key, its message number, or both: each
@@ -973,7 +1056,7 @@ void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
             IgnoreLists::IsMessageNumberIgnored(std::to_string(popupResult_->MessageNumber())));
         menu = mnuIgnoredPopup_;
     }
-    menu->popup(list->viewport()->mapToGlobal(at));
+    menu->popup(globalPosition);
 }
 
 // --- Commands ------------------------------------------------------------------------------
@@ -1151,8 +1234,7 @@ void frmVerifier::ShowSelectedResult() {
     if (tab == OutputLogTab)
         return;
     const bool ignoredList = tab == IgnoredResultsTab;
-    const QTreeWidget* list = lvResults_[ignoredList ? 1 : 0];
-    const ResultPtr result = ResultOf(list->currentItem());
+    const ResultPtr result = SelectedResult(lvResults_[ignoredList ? 1 : 0]);
     if (!result) {
         fraResultDetails_->ShowResult(nullptr);
         return;

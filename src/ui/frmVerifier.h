@@ -11,10 +11,13 @@
 
 #include "DialogPresenter.h"
 #include "HelpProvider.h"
+#include "ResultsModel.h"
 #include "engine/INotificationClient.h"
 #include "engine/Result.h"
+#include "engine/ResultGrouping.h"
 
 class QAction;
+class QComboBox;
 class QGroupBox;
 class QLabel;
 class QLineEdit;
@@ -24,12 +27,13 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTabWidget;
-class QTreeWidget;
-class QTreeWidgetItem;
+class QTimer;
+class QToolButton;
 
 namespace vtr {
 
 class ResultDetailsPane;
+class ResultsView;
 
 // The three severity images of the result lists, keyed "Info", "Warning" and "Error".
 class SeverityImageList : public QObject {
@@ -67,7 +71,12 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // The tabs of sstDetails, in order.
     enum Tab { OutputLogTab = 0, ResultsTab = 1, IgnoredResultsTab = 2 };
     // The columns of both result lists.
-    enum Column { DescriptionColumn = 0, SeverityColumn = 1, MsgNumColumn = 2, Details1Column = 3 };
+    enum Column {
+        DescriptionColumn = ResultsModel::DescriptionColumn,
+        SeverityColumn = ResultsModel::SeverityColumn,
+        MsgNumColumn = ResultsModel::MsgNumColumn,
+        Details1Column = ResultsModel::Details1Column
+    };
 
     // Loads the window: caption, notification client, help, the event pump and busy pointer
     // hooks, and the driver's collections (BeginVerification once).
@@ -125,6 +134,8 @@ class frmVerifier : public QMainWindow, public INotificationClient {
 
     // Moves every listed result to the list its Ignorable now calls for.
     void RefreshIgnoredResults();
+    // The lists' filter, order and grouping, as the controls above the lists choose them.
+    ResultQuery ChosenQuery() const;
     // Sets the four count labels from the driver's counts.
     void RefreshSummary();
     // Writes one line to the output log: time stamp, ": ", the text, in the colour of its
@@ -135,8 +146,8 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // blue, Warning orange, Error red, other lines black. On a dark one: lighter tones of the
     // same, other lines in the palette's text colour.
     static QColor LogColour(int kind, const QPalette& palette);
-    // The result behind a list item (the item's tag); null for anything else.
-    static ResultPtr ResultOf(const QTreeWidgetItem* item);
+    // The result of a row of either list; null for a group's row or anything else.
+    static ResultPtr ResultOf(const QModelIndex& index);
 
     bool IsRunning() const { return running_; }
 
@@ -152,7 +163,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
 
   private:
     void BuildControls();
-    QTreeWidget* BuildResultList(const QString& name);
+    ResultsView* BuildResultList(const QString& name, Listing listing);
+    // The filter box, the severity toggles, errors first, group by, and "N of M shown".
+    QWidget* BuildFindBar(QWidget* parent);
     void BuildMenus();
     void InstallPlatformHooks();
     // The event pump the core calls while a run goes.
@@ -172,14 +185,19 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void ResetSummary();
     void ApplyTarget();
     void ChooseTarget(bool sequence);
-    void AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order);
-    // Adds change to the count of the result's severity, if it is counted.
-    void CountListed(const Result& result, int change);
-    void MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item);
-    void ShowResultPopup(QTreeWidget* list, const QPoint& position);
+    // The lists take the results added since they last looked: now, or (while a run goes)
+    // as often as each list can afford.
+    void TakeNewResults(bool now);
+    // Both lists laid out again from the grouping, keeping the selected row in view.
+    void RelayoutLists();
+    // Applies the chosen filter, order and grouping to both lists.
+    void ApplyQuery();
+    // "N of M shown" for the list on view.
+    void ShowCounts();
+    void ShowResultPopup(ResultsView* list, const QModelIndex& index, const QPoint& globalPosition);
     // The details pane follows the selected result of the list shown.
     void ShowSelectedResult();
-    ResultPtr SelectedResult(const QTreeWidget* list) const;
+    ResultPtr SelectedResult(const ResultsView* list) const;
     // Changes the ignore lists for a result and moves the listed results accordingly; a
     // failure is shown under "Ignore List Error".
     template <typename Change>
@@ -205,7 +223,18 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // Details.
     QTabWidget* sstDetails_ = nullptr;
     QPlainTextEdit* rtxOutputLog_ = nullptr;
-    QTreeWidget* lvResults_[2] = {nullptr, nullptr};
+    // The run's results, for both lists; each list is a view of it.
+    ResultGrouping grouping_;
+    ResultsView* lvResults_[2] = {nullptr, nullptr};
+    // Finding what matters.
+    QLineEdit* txtFilter_ = nullptr;
+    QToolButton* chkShowErrors_ = nullptr;
+    QToolButton* chkShowWarnings_ = nullptr;
+    QToolButton* chkShowInfo_ = nullptr;
+    QToolButton* chkErrorsFirst_ = nullptr;
+    QComboBox* cboGroupBy_ = nullptr;
+    QLabel* lblShown_ = nullptr;
+    QTimer* filterTimer_ = nullptr;
     SeverityImageList* imlSeverity_ = nullptr;
     ResultDetailsPane* fraResultDetails_ = nullptr;
     // Summary.
@@ -243,10 +272,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     bool runCancelled_ = false;  // the last run ended by cancellation
     int checksDropped_ = 0;      // the checks its cancellation dropped from the queue
     bool closeWhenFinished_ = false;
-    qint64 resultsListed_ = 0;  // the order of the next result listed
-    // The errors and warnings in the Results list.
-    int errorsListed_ = 0;
-    int warningsListed_ = 0;
+    // How often lists that must be laid out whole take new results while a run goes.
+    static constexpr qint64 kRelayoutIntervalMs = 400;
+    QElapsedTimer relayoutClock_;
 };
 
 }  // namespace vtr
