@@ -114,6 +114,7 @@ class TempFilesRemover {
 
 constexpr const char* kReportWhat = "results file";
 constexpr const char* kReportSource = "vantori-verify";
+constexpr const char* kBaselineWhat = "baseline";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -225,6 +226,8 @@ int RunVerify(const Options& givenOptions, Console& console) {
         // The report would replace the target or the store: said before the run, not after.
         if (options.output)
             OutputFile::RefuseInput(*options.output, kReportWhat, kReportSource);
+        if (options.writeBaseline)
+            OutputFile::RefuseInput(*options.writeBaseline, kBaselineWhat, kReportSource);
     } catch (const VtrError& error) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
@@ -268,7 +271,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
                               " was not written: the verification was cancelled");
     } else if (options.writeBaseline) {
         try {
-            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), "baseline",
+            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), kBaselineWhat,
                               kReportSource);
         } catch (const VtrError& error) {
             Fail(console.err, error.Description());
