@@ -1250,9 +1250,19 @@ void frmVerifier::ShowSelectedResult() {
     if (tab == OutputLogTab)
         return;
     const bool ignoredList = tab == IgnoredResultsTab;
-    const ResultPtr result = SelectedResult(lvResults_[ignoredList ? 1 : 0]);
+    const ResultsView* list = lvResults_[ignoredList ? 1 : 0];
+    const ResultPtr result = SelectedResult(list);
     if (!result) {
-        fraResultDetails_->ShowResult(nullptr);
+        const QModelIndex current = list->currentIndex();
+        const ResultGroup* group = list->Model()->GroupAt(current);
+        if (group != nullptr && list->selectionModel()->isSelected(current)) {
+            fraResultDetails_->ShowGroup(
+                FromSuiteText(group->title),
+                imlSeverity_->Image(FromSuiteText(SeverityText(group->worst))),
+                ResultsModel::CountsText(group->counts));
+        } else {
+            fraResultDetails_->ShowResult(nullptr);
+        }
         return;
     }
     QString ignoredBy;
