@@ -207,12 +207,16 @@ void frmVerifier::PumpEvents() {
     }
     // During a run the core calls this after every check and result, thousands of times
     // on a large schedule. Input is handled every time, so a click on Cancel is seen at
-    // once; what the run changes on screen (the log, the lists, the summary) changes at
-    // most every kRepaintIntervalMs, since laying out and drawing costs far more than a
-    // check: in between, handling events finds nothing to draw.
+    // once; what the run changes on screen changes at most every kRepaintIntervalMs (the
+    // summary, the lists that are cheap to add to) or kLogIntervalMs (the log, which costs
+    // the most to lay out and draw), since that costs far more than a check: in between,
+    // handling events finds nothing to draw.
     if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
         repaintClock_.restart();
-        FlushLog();
+        if (!logClock_.isValid() || logClock_.hasExpired(kLogIntervalMs)) {
+            logClock_.restart();
+            FlushLog();
+        }
         TakeNewResults(false);
         if (summaryPending_)
             RefreshSummary();
@@ -781,6 +785,7 @@ void frmVerifier::SetRunning(bool running) {
         FlushLog();
         TakeNewResults(true);
         repaintClock_.invalidate();
+        logClock_.invalidate();
         lblStatus_->setText(statusText_);
     }
     cmdCancel_->setEnabled(running);
@@ -822,9 +827,8 @@ void frmVerifier::RefreshSummary() {
     lblChecksRemainingCount_->setText(QString::number(remaining));
     // The errors and warnings of the Results list (whatever its filter hides): as the
     // driver counts them until the user ignores or stops ignoring a result.
-    const SeverityCounts listed = grouping_.Counts(Listing::NotIgnored);
-    lblErrorsCount_->setText(QString::number(listed.errors));
-    lblWarningsCount_->setText(QString::number(listed.warnings));
+    lblErrorsCount_->setText(QString::number(listedCounts_.errors));
+    lblWarningsCount_->setText(QString::number(listedCounts_.warnings));
     // A cancelled run stops short of the checks it dropped, and says so.
     const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
@@ -957,6 +961,7 @@ void frmVerifier::Initializing() {
     pendingLog_.clear();
     rtxOutputLog_->clear();
     grouping_.Clear();
+    listedCounts_ = SeverityCounts();
     for (ResultsView* list : lvResults_)
         list->Model()->Clear();
     popupResult_.reset();
@@ -967,7 +972,10 @@ void frmVerifier::Initializing() {
 }
 
 void frmVerifier::ResultAdded(const ResultPtr& result) {
-    grouping_.Add(result, result->Ignorable());
+    const bool ignored = result->Ignorable();
+    grouping_.Add(result, ignored);
+    if (!ignored)
+        listedCounts_.Add(result->Severity());
     // While a run goes, the lists take new results when the window is drawn.
     if (!running_)
         TakeNewResults(true);
@@ -1045,6 +1053,7 @@ void frmVerifier::RefreshIgnoredResults() {
     }
     if (!moved)
         return;
+    listedCounts_ = grouping_.Counts(Listing::NotIgnored);
     RelayoutLists();
     SummaryChanged();
 }
