@@ -98,6 +98,13 @@ QString AbsoluteTarget(const QString& path) {
         QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
 }
 
+// Whether two queries show a listing alike: the same filter, order and grouping.
+bool SameView(const ResultQuery& a, const ResultQuery& b) {
+    return a.filter.text == b.filter.text && a.filter.errors == b.filter.errors &&
+           a.filter.warnings == b.filter.warnings && a.filter.info == b.filter.info &&
+           a.order == b.order && a.groupBy == b.groupBy;
+}
+
 QString ErrorText(const std::exception& error) {
     if (const auto* vtrError = dynamic_cast<const VtrError*>(&error))
         return FromSuiteText(vtrError->Description());
@@ -186,6 +193,14 @@ frmVerifier::frmVerifier(Options options, QWidget* parent)
 }
 
 frmVerifier::~frmVerifier() {
+    // The lists' models read grouping_, a member that is gone before QWidget's own destructor
+    // hides the lists and lays them out one last time: the lists let go of them first.
+    for (ResultsView* list : lvResults_) {
+        if (list) {
+            const QSignalBlocker blocker(list);
+            list->setModel(nullptr);
+        }
+    }
     LibVerify::RemoveNotificationClient(this);
     LibVerify::SetEventPump(nullptr);
     ScopedMousePointer::InstallHooks(nullptr, nullptr);
@@ -582,11 +597,7 @@ void frmVerifier::ApplyQuery() {
     filterTimer_->stop();
     const ResultQuery query = ChosenQuery();
     for (ResultsView* list : lvResults_) {
-        const ResultQuery& shown = list->Model()->Query();
-        if (shown.filter.text == query.filter.text && shown.filter.errors == query.filter.errors &&
-            shown.filter.warnings == query.filter.warnings &&
-            shown.filter.info == query.filter.info && shown.order == query.order &&
-            shown.groupBy == query.groupBy)
+        if (SameView(list->Model()->Query(), query))
             continue;
         list->Model()->SetQuery(query);
         // The selected result stays in view.
