@@ -179,6 +179,11 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
     }
+    // A store that is missing or cannot be read still gives a verification (with no
+    // settings), but the user is told first which store it was and why it was that one.
+    const RegistryStore::Description store = RegistryStore::Describe();
+    if (const std::string problem = store.Problem(); !problem.empty())
+        Fail(console.err, problem);
 
     std::unique_ptr<ProgressLine> progress;
     if (console.errIsTerminal && !options.quiet)
@@ -243,6 +248,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.cancelled = observer.Cancelled() || LibVerify::IsCancelled();
     record.checksPerformed = LibVerify::ChecksPerformedCount();
     record.results = observer.TakeResults();
+    record.store = store;
     if (baseline)
         baseline->Mark(record);
 
@@ -306,6 +312,9 @@ int Main(int argc, const char* const* argv, Console& console) {
             case Command::Unignore:
                 return RunIgnoreCommand(options, console.out, console.err);
             case Command::ListIgnored:
+                if (const std::string problem = RegistryStore::Describe().Problem();
+                    !problem.empty())
+                    Fail(console.err, problem);
                 return RunListIgnored(options, console.out);
         }
         return ExitStatus::Usage;
