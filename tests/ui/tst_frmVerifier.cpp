@@ -1656,6 +1656,12 @@ void FrmVerifierTest::groupsCarryTheirCounts() {
                      QStringLiteral("Message 47: Intensity file conflict (1)"),
                      QStringLiteral("Message 21: Show file does not exist (1)")}));
     QCOMPARE(Shown(), QStringLiteral("7 of 7 shown"));
+    // A group's row, selected, is told in the details pane.
+    QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, OnItem(list, Row(list, 0)));
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(),
+             QStringLiteral("Message 43: Channel conflict"));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(), QStringLiteral("2 warnings"));
+    QVERIFY(!Find<QPushButton>("cmdCopyResult")->isEnabled());
     // A group's row spans the list; it opens into its results.
     QVERIFY(list->isFirstColumnSpanned(0, QModelIndex()));
     QVERIFY(!list->isExpanded(Row(list, 0)));
