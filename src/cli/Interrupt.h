@@ -15,8 +15,9 @@ enum class Interruption { None, CtrlC, Terminate, HangUp, OutputClosed };
 // process as usual. SIGPIPE counts once; after it, writes fail quietly instead, and stay so
 // when the guard ends, since the output is gone.
 //
-// On Windows the console's control handler does the same for Ctrl-C and Ctrl-Break; the
-// console closing, a log-off or a shutdown removes the temporary files and ends at once.
+// On Windows the console's control handler (and a SIGINT handler, for SIGINT raised inside
+// the program) does the same for Ctrl-C and Ctrl-Break; the console closing, a log-off or a
+// shutdown removes the temporary files and ends at once.
 //
 // The handlers that were in place come back when the guard ends.
 class InterruptGuard {
@@ -29,6 +30,11 @@ class InterruptGuard {
     // The first request since the guard was made; None when there was none.
     static Interruption Requested();
 };
+
+// For the rest of the program: an error that ends it through std::terminate (one that
+// escaped a destructor, say) removes the registered temporary files first, and a limit on the
+// size of files (SIGXFSZ) makes the write fail with its reason instead of killing the program.
+void InstallLastResortCleanUp();
 
 // What the program says when it starts cancelling for that reason, e.g. "Ctrl-C: cancelling
 // ...".

@@ -167,6 +167,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // The filter box, the severity toggles, errors first, group by, and "N of M shown".
     QWidget* BuildFindBar(QWidget* parent);
     void BuildMenus();
+    void SetTabOrder();
     void InstallPlatformHooks();
     // The event pump the core calls while a run goes.
     void PumpEvents();
@@ -225,6 +226,8 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QPlainTextEdit* rtxOutputLog_ = nullptr;
     // The run's results, for both lists; each list is a view of it.
     ResultGrouping grouping_;
+    // What the Results list holds, by severity (whatever its filter hides).
+    SeverityCounts listedCounts_;
     ResultsView* lvResults_[2] = {nullptr, nullptr};
     // Finding what matters.
     QLineEdit* txtFilter_ = nullptr;
@@ -260,7 +263,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
     static constexpr qint64 kRepaintIntervalMs = 50;
+    static constexpr qint64 kLogIntervalMs = 200;
     QElapsedTimer repaintClock_;
+    QElapsedTimer logClock_;
     bool summaryPending_ = false;
     struct LogLine {
         QString text;
