@@ -5,8 +5,6 @@
 #include <algorithm>
 #include <cctype>
 #include <ostream>
-#include <sstream>
-#include <unordered_map>
 
 #include "VtrVersion.h"
 #include "engine/IgnoreKeyText.h"
@@ -128,13 +126,14 @@ void WriteResult(std::ostream& out, const Prepared& prepared, const Result& resu
 }
 
 // One listing (the results, or the ignored ones), errors first, under headings when grouped.
-void WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) {
+// False when it listed nothing.
+bool WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) {
     const ResultView view =
         prepared.View(listing, ResultOrder::ErrorsFirst, prepared.Settings().groupBy);
     if (view.groups.empty()) {
         for (const std::size_t i : view.shown)
             WriteResult(out, prepared, *prepared.Grouping().At(i));
-        return;
+        return !view.shown.empty();
     }
     bool first = true;
     for (const ResultGroup& group : view.groups) {
@@ -147,6 +146,7 @@ void WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) 
         for (const std::size_t i : group.members)
             WriteResult(out, prepared, *prepared.Grouping().At(i));
     }
+    return true;
 }
 
 // Counts instead of results: per message number and, when grouped, per group.
@@ -247,6 +247,77 @@ nlohmann::ordered_json CountsJson(const SeverityCounts& counts, int64_t ignored)
     return json;
 }
 
+// Writes a JSON document a piece at a time, laid out exactly as nlohmann's dump with an indent
+// of two: objects and arrays are opened and closed here, each value in them is dumped on its
+// own, so a long list never becomes a second document in memory. Bytes that are not UTF-8
+// are written as U+FFFD.
+class JsonWriter {
+  public:
+    explicit JsonWriter(std::ostream& out) : out_(out) {}
+
+    void BeginObject() { Begin('{'); }
+    void EndObject() { End('}'); }
+    void BeginArray() { Begin('['); }
+    void EndArray() { End(']'); }
+
+    // The key of the next member of the open object.
+    void Key(const char* key) {
+        Next();
+        out_ << '"' << key << "\": ";
+        keyed_ = true;
+    }
+    void Member(const char* key, const nlohmann::ordered_json& value) {
+        Key(key);
+        Value(value);
+    }
+    // The next element of the open array.
+    void Element(const nlohmann::ordered_json& value) {
+        Next();
+        Value(value);
+    }
+
+  private:
+    void Begin(char bracket) {
+        if (!keyed_ && !open_.empty())
+            Next();
+        keyed_ = false;
+        out_ << bracket;
+        open_.push_back(true);
+    }
+    void End(char bracket) {
+        const bool empty = open_.back();
+        open_.pop_back();
+        if (!empty)
+            out_ << '\n' << std::string(2 * open_.size(), ' ');
+        out_ << bracket;
+    }
+    // Starts the next member or element of the open object or array on a line of its own.
+    void Next() {
+        out_ << (open_.back() ? "\n" : ",\n") << std::string(2 * open_.size(), ' ');
+        open_.back() = false;
+    }
+    // A whole value, its lines after the first shifted to the depth it stands at (the line
+    // breaks of a dump are all layout: those inside strings are escaped).
+    void Value(const nlohmann::ordered_json& value) {
+        keyed_ = false;
+        text_ = value.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace);
+        const std::string indent(2 * open_.size(), ' ');
+        std::size_t start = 0;
+        for (std::size_t end = text_.find('\n'); end != std::string::npos;
+             end = text_.find('\n', start)) {
+            out_.write(text_.data() + start, static_cast<std::streamsize>(end + 1 - start));
+            out_ << indent;
+            start = end + 1;
+        }
+        out_.write(text_.data() + start, static_cast<std::streamsize>(text_.size() - start));
+    }
+
+    std::ostream& out_;
+    std::vector<bool> open_;  // per open object or array: nothing in it yet
+    bool keyed_ = false;      // a key was written and waits for its value
+    std::string text_;        // the last value dumped, its buffer used again
+};
+
 }  // namespace
 
 int ExitStatusOf(const RunRecord& record, FailOn failOn) {
@@ -273,48 +344,34 @@ std::string SummaryLine(const RunRecord& record, const Presentation& presentatio
 
 void WriteText(std::ostream& out, const RunRecord& record, const Presentation& presentation) {
     const Prepared prepared(record, presentation);
-    std::ostringstream body;
+    // Written straight to the stream; a blank line between what is listed and the summary,
+    // when anything is.
+    bool listed = true;
     if (presentation.statistics) {
-        WriteStatistics(body, prepared);
+        WriteStatistics(out, prepared);
     } else {
-        WriteListing(body, prepared, Listing::NotIgnored);
+        listed = WriteListing(out, prepared, Listing::NotIgnored);
         if (!prepared.View(Listing::Ignored, ResultOrder::RunOrder, GroupBy::None).shown.empty()) {
-            body << "\nIgnored results:\n";
-            WriteListing(body, prepared, Listing::Ignored);
+            out << "\nIgnored results:\n";
+            WriteListing(out, prepared, Listing::Ignored);
+            listed = true;
         }
     }
-    // A blank line between what is listed and the summary, when anything is.
-    if (const std::string listed = body.str(); !listed.empty())
-        out << listed << "\n";
+    if (listed)
+        out << "\n";
     out << SummaryOf(prepared, record) << "\n";
 }
 
 void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& presentation) {
     const Prepared prepared(record, presentation);
     const ResultGrouping& grouping = prepared.Grouping();
+    const ResultView listed = prepared.View(Listing::All, ResultOrder::RunOrder, GroupBy::None);
+    const SeverityCounts counts = grouping.Counts(Listing::NotIgnored);
 
     nlohmann::ordered_json target;
     target["kind"] = TargetKindName(record.target);
     if (record.target != TargetKind::Schedule)
         target["file"] = record.targetFile;
-
-    const ResultView listed = prepared.View(Listing::All, ResultOrder::RunOrder, GroupBy::None);
-    std::unordered_map<std::size_t, std::size_t> position;
-    nlohmann::ordered_json results = nlohmann::ordered_json::array();
-    for (const std::size_t i : listed.shown) {
-        const Result& result = *grouping.At(i);
-        position[i] = results.size();
-        nlohmann::ordered_json item;
-        item["severity"] = static_cast<int32_t>(result.Severity());
-        item["severityText"] = result.SeverityText();
-        item["messageNumber"] = result.MessageNumber();
-        item["helpContextId"] = result.HelpContextID();
-        item["summary"] = result.Summary();
-        item["details"] = result.Details();
-        item["ignored"] = grouping.Ignored(i);
-        item["ignoreKey"] = IgnoreKeyText::Encode(result.IgnoreKey());
-        results.push_back(std::move(item));
-    }
 
     nlohmann::ordered_json store;
     store["path"] = record.store.file ? nlohmann::ordered_json(*record.store.file) : nullptr;
@@ -323,49 +380,70 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
     store["understood"] = record.store.condition.understood;
     store["readOnly"] = record.store.condition.readOnly;
 
-    const SeverityCounts counts = grouping.Counts(Listing::NotIgnored);
-    nlohmann::ordered_json document;
-    document["program"] = "vantori-verify";
-    document["version"] = kVersionText;
-    document["target"] = std::move(target);
-    document["store"] = std::move(store);
-    document["cancelled"] = record.cancelled;
-    document["checksPerformed"] = record.checksPerformed;
-    document["errors"] = counts.errors;
-    document["warnings"] = counts.warnings;
-    document["counts"] = CountsJson(counts, grouping.Counts(Listing::Ignored).Total());
+    JsonWriter json(out);
+    json.BeginObject();
+    json.Member("program", "vantori-verify");
+    json.Member("version", kVersionText);
+    json.Member("target", target);
+    json.Member("store", store);
+    json.Member("cancelled", record.cancelled);
+    json.Member("checksPerformed", record.checksPerformed);
+    json.Member("errors", counts.errors);
+    json.Member("warnings", counts.warnings);
+    json.Member("counts", CountsJson(counts, grouping.Counts(Listing::Ignored).Total()));
     if (presentation.minimumSeverity != Severity::Info) {
-        document["severity"] = LowerSeverityText(presentation.minimumSeverity);
-        document["hidden"] = listed.hidden;
+        json.Member("severity", LowerSeverityText(presentation.minimumSeverity));
+        json.Member("hidden", listed.hidden);
     }
     if (presentation.baselineFile) {
-        document["baseline"] = {{"file", *presentation.baselineFile},
-                                {"inBaseline", prepared.InBaseline()}};
+        json.Member("baseline",
+                    {{"file", *presentation.baselineFile}, {"inBaseline", prepared.InBaseline()}});
     }
-    document["results"] = std::move(results);
+
+    // The results one at a time, each its own small document.
+    json.Key("results");
+    json.BeginArray();
+    nlohmann::ordered_json item;
+    for (const std::size_t i : listed.shown) {
+        const Result& result = *grouping.At(i);
+        item["severity"] = static_cast<int32_t>(result.Severity());
+        item["severityText"] = result.SeverityText();
+        item["messageNumber"] = result.MessageNumber();
+        item["helpContextId"] = result.HelpContextID();
+        item["summary"] = result.Summary();
+        item["details"] = result.Details();
+        item["ignored"] = grouping.Ignored(i);
+        item["ignoreKey"] = IgnoreKeyText::Encode(result.IgnoreKey());
+        json.Element(item);
+    }
+    json.EndArray();
 
     if (presentation.groupBy != GroupBy::None) {
-        nlohmann::ordered_json groups = nlohmann::ordered_json::array();
+        json.Key("groups");
+        json.BeginArray();
         for (const ResultGroup& group :
              prepared.View(Listing::All, ResultOrder::RunOrder, presentation.groupBy).groups) {
             SeverityCounts groupCounts;
             int64_t ignored = 0;
             nlohmann::ordered_json members = nlohmann::ordered_json::array();
             for (const std::size_t i : group.members) {
-                members.push_back(position.at(i));
+                // Where the result stands in "results", which lists them in run order.
+                members.push_back(static_cast<std::size_t>(
+                    std::lower_bound(listed.shown.begin(), listed.shown.end(), i) -
+                    listed.shown.begin()));
                 if (grouping.Ignored(i))
                     ++ignored;
                 else
                     groupCounts.Add(grouping.At(i)->Severity());
             }
-            nlohmann::ordered_json item;
-            item["key"] = IgnoreKeyText::Encode(group.key);
-            item["title"] = group.title;
-            item["counts"] = CountsJson(groupCounts, ignored);
-            item["results"] = std::move(members);
-            groups.push_back(std::move(item));
+            nlohmann::ordered_json entry;
+            entry["key"] = IgnoreKeyText::Encode(group.key);
+            entry["title"] = group.title;
+            entry["counts"] = CountsJson(groupCounts, ignored);
+            entry["results"] = std::move(members);
+            json.Element(entry);
         }
-        document["groups"] = std::move(groups);
+        json.EndArray();
     }
     if (presentation.statistics) {
         nlohmann::ordered_json statistics = nlohmann::ordered_json::array();
@@ -377,9 +455,10 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
                                   {"count", statistic.count},
                                   {"summary", statistic.summary}});
         }
-        document["statistics"] = std::move(statistics);
+        json.Member("statistics", statistics);
     }
-    out << document.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace) << "\n";
+    json.EndObject();
+    out << "\n";
 }
 
 }  // namespace vtr::cli
