@@ -17,7 +17,11 @@ std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileNa
 }
 
 void SequenceLoader::OnProgress(int32_t percent) {
-    LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName_);
+    TellProgress(fileName_, percent);
+}
+
+void SequenceLoader::TellProgress(const std::string& fileName, int32_t percent) {
+    LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName);
     LibVerify::ProcessPendingEvents();
 }
 
