@@ -41,12 +41,16 @@ void* operator new(std::size_t bytes) {
     heapPeak = std::max(heapPeak, heapInUse);
     return memory;
 }
+// The replaced operator new takes its memory from malloc, so free is its match.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wmismatched-new-delete"
 void operator delete(void* memory) noexcept {
     if (memory == nullptr)
         return;
     heapInUse -= malloc_usable_size(memory);
     std::free(memory);
 }
+#pragma GCC diagnostic pop
 void operator delete(void* memory, std::size_t) noexcept {
     operator delete(memory);
 }

@@ -332,12 +332,11 @@ void ForEachListed(const Show& show, Visit&& visit) {
 std::vector<std::string> CheckIntersequenceConflicts::SequenceFiles(const Show& show) const {
     std::vector<std::string> files;
     ForEachListed(show, [&](int32_t, const std::string& name) {
-        if (name.empty())
-            return;
-        files.push_back(
-            CheckSequenceFileExists::IsEditFile(name)
-                ? ResumeOr(std::string(), [&] { return SequenceUtils::GetR9PlaybackFile(name); })
-                : name);
+        // An edit file names its playback file only when read, and reading it reports what
+        // is wrong with it: that is the walk's to do, in its turn, so its sequence is left to
+        // be loaded then.
+        if (!name.empty() && !CheckSequenceFileExists::IsEditFile(name))
+            files.push_back(name);
     });
     return files;
 }

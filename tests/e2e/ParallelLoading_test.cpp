@@ -103,7 +103,8 @@ class ParallelLoading : public testsupport::StoreTest {
     // Runs with one job and with several, and compares everything told.
     void ExpectSameWhateverTheJobs(int cancelAt = 0) {
         const Told serial = Run(1, cancelAt);
-        ASSERT_GT(serial.sequenceLoads, 0);
+        if (cancelAt == 0)
+            ASSERT_GT(serial.sequenceLoads, 0);
         for (const int jobs : {2, 4}) {
             SCOPED_TRACE("jobs " + std::to_string(jobs));
             const Told parallel = Run(jobs, cancelAt);

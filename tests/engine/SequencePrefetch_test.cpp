@@ -3,15 +3,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <exception>
 #include <optional>
 #include <string>
 
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
 #include "sequencelib/SequenceGenerator.h"
-#include "support/Raised.h"
 #include "support/TempStore.h"
 
 namespace vtr {
@@ -29,54 +26,6 @@ class SequencePrefetchTest : public ::testing::Test {
 
     testsupport::TempFolder folder_;
 };
-
-TEST_F(SequencePrefetchTest, AFileWantedIsLoadedWithItsProgressKeptForTheCaller) {
-    const std::string a = Write("A.las", 12);
-    const std::string b = Write("B.las", 30);
-    SequencePrefetch prefetch(2, 4);
-    prefetch.Want(a);
-    prefetch.Want(b);
-    prefetch.Want(a);  // named twice, loaded once
-
-    std::optional<SequencePrefetch::Load> second = prefetch.Take(b);
-    ASSERT_TRUE(second.has_value());
-    ASSERT_NE(second->sequence, nullptr);
-    EXPECT_EQ(second->sequence->Channels().size(), 30u);
-    EXPECT_FALSE(second->failure);
-    // Told from the start to the end, each percent once, rising.
-    ASSERT_GE(second->progress.size(), 2u);
-    EXPECT_EQ(second->progress.front(), 0);
-    EXPECT_EQ(second->progress.back(), 100);
-    EXPECT_TRUE(std::is_sorted(second->progress.begin(), second->progress.end()));
-    EXPECT_EQ(std::adjacent_find(second->progress.begin(), second->progress.end()),
-              second->progress.end());
-
-    const std::optional<SequencePrefetch::Load> first = prefetch.Take(a);
-    ASSERT_TRUE(first.has_value());
-    EXPECT_EQ(first->sequence->Channels().size(), 12u);
-    // Taken once: from now on the file is the caller's.
-    EXPECT_FALSE(prefetch.Take(a).has_value());
-}
-
-TEST_F(SequencePrefetchTest, AFileThatCannotLoadHandsTheCallerTheSameErrorAsLoadingItThere) {
-    const std::string missing = folder_.File("Missing.las");
-    const std::string broken = folder_.File("Broken.las");
-    testsupport::WriteFileBytes(broken, "<?xml version=\"1.0\"?><sequence><channels><chan");
-    SequencePrefetch prefetch(1, 2);
-    for (const std::string& file : {missing, broken}) {
-        SCOPED_TRACE(file);
-        prefetch.Want(file);
-        const std::optional<SequencePrefetch::Load> load = prefetch.Take(file);
-        ASSERT_TRUE(load.has_value());
-        EXPECT_EQ(load->sequence, nullptr);
-        ASSERT_TRUE(load->failure);
-        const std::string expected =
-            testsupport::RaisedDescription([&] { seqlib::Sequence().Load(file); });
-        ASSERT_FALSE(expected.empty());
-        EXPECT_EQ(testsupport::RaisedDescription([&] { std::rethrow_exception(load->failure); }),
-                  expected);
-    }
-}
 
 TEST_F(SequencePrefetchTest, AFileTheCallerAskedForFirstIsNeverLoadedByAWorker) {
     const std::string a = Write("A.las", 4);
