@@ -129,7 +129,7 @@ std::optional<uint32_t> FindEntry(Reader& file, uint64_t resourceBase, uint32_t 
     const uint32_t entriesOffset = directoryOffset + kResourceDirectorySize;
     if (count == 0 || entriesOffset > resourceSize ||
         count * kResourceEntrySize > resourceSize - entriesOffset ||
-        !file.Read(resourceBase + entriesOffset, count * kResourceEntrySize, bytes)) {
+        !file.Read(resourceBase + entriesOffset, std::size_t{count} * kResourceEntrySize, bytes)) {
         return std::nullopt;
     }
     for (uint32_t i = 0; i < count; ++i) {
