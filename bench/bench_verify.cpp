@@ -39,13 +39,13 @@
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
 #include "sequencelib/Sequence.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
-#include "support/PeImage.h"
 #include "support/SequenceBenchSupport.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 #if defined(__unix__)
 #include <fcntl.h>

@@ -12,8 +12,8 @@
 
 #include "checks/CheckAppFileExists.h"
 #include "checks/CheckAppPathExists.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "show/Serialize.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace vtr::demo {
 namespace {

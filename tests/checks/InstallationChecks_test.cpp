@@ -24,8 +24,8 @@
 #include "checks/CheckWMP.h"
 #include "engine/LibVerify.h"
 #include "environment/VTRCommon.h"
-#include "support/PeImage.h"
 #include "support/VerifierFixture.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr {
 namespace {

@@ -9,9 +9,9 @@
 
 #include "checks/CheckAppFileExists.h"
 #include "environment/FileVersion.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::demo {
 namespace {

@@ -6,7 +6,7 @@
 #include "checks/CheckAppPathExists.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryFile.h"
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::testsupport {
 

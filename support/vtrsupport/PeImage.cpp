@@ -1,4 +1,4 @@
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 
 #include <array>
 #include <fstream>

@@ -1,4 +1,4 @@
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -12,11 +12,11 @@
 #include "schedule/Schedule.h"
 #include "schedule/WeekTime.h"
 #include "schedule/YearSchedule.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "show/Serialize.h"
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace vtr::gen {
 
