@@ -25,10 +25,9 @@ std::string BlobberKindName(seqlib::IntensityFileKind kind) {
                                                         : "Novalux Intensity File";
 }
 
-bool BlobberConflictHelper::DevicesConflict(int32_t type1, int32_t network1, uint8_t unit1,
-                                            int16_t start1, int16_t count1, int32_t type2,
-                                            int32_t network2, uint8_t unit2, int16_t start2,
-                                            int16_t count2) const {
+bool DeviceOverlap::DevicesConflict(int32_t type1, int32_t network1, uint8_t unit1, int16_t start1,
+                                    int16_t count1, int32_t type2, int32_t network2, uint8_t unit2,
+                                    int16_t start2, int16_t count2) const {
     if (type1 != type2)
         return false;
     if (deviceTypeInfo_.HasNetwork(type1) && network1 != network2)
@@ -46,55 +45,14 @@ bool BlobberConflictHelper::DevicesConflict(int32_t type1, int32_t network1, uin
     return !(low1 > high2 || low2 > high1);
 }
 
-bool BlobberConflictHelper::DevicesConflict(const seqlib::DeviceAddress& first,
-                                            const seqlib::DeviceAddress& second) const {
+bool DeviceOverlap::DevicesConflict(const seqlib::DeviceAddress& first,
+                                    const seqlib::DeviceAddress& second) const {
     return DevicesConflict(first.DeviceType(), first.Network(), first.Unit(), first.StartAddress(),
                            first.NumAddresses(), second.DeviceType(), second.Network(),
                            second.Unit(), second.StartAddress(), second.NumAddresses());
 }
 
-void BlobberConflictHelper::CheckForBlobberConflicts(const Blobber& blobber,
-                                                     std::span<const Blobber> others, bool& found) {
-    if (blobber.file == nullptr)
-        return;
-    const auto& devices = blobber.file->Devices();
-    for (std::size_t i = 0; i < devices.size(); ++i) {
-        for (const Blobber& other : others) {
-            if (other.file == nullptr)
-                continue;
-            const auto& otherDevices = other.file->Devices();
-            const std::size_t first = other.file == blobber.file ? i + 1 : 0;
-            for (std::size_t k = first; k < otherDevices.size(); ++k) {
-                if (DevicesConflict(devices[i], otherDevices[k])) {
-                    found = true;
-                    if (BlobberConflict)
-                        BlobberConflict(blobber.context, devices[i], other.context,
-                                        otherDevices[k]);
-                }
-            }
-        }
-        if (BlobberCheckDeviceProgress)
-            BlobberCheckDeviceProgress(static_cast<int32_t>(i));
-    }
-}
-
-void BlobberConflictHelper::CheckForChannelConflicts(const Blobber& blobber,
-                                                     const seqlib::Channel* channel,
-                                                     const std::any& channelContext, bool& found) {
-    if (blobber.file == nullptr || channel == nullptr || !channel->HasPhysicalSettings())
-        return;
-    const seqlib::DeviceAddress circuit(channel->DeviceType(), channel->Network(), channel->Unit(),
-                                        channel->Circuit(), 1);
-    for (const seqlib::DeviceAddress& device : blobber.file->Devices()) {
-        if (DevicesConflict(device, circuit)) {
-            found = true;
-            if (ChannelConflict)
-                ChannelConflict(blobber.context, device, channelContext, *channel);
-        }
-    }
-}
-
-int32_t BlobberConflictHelper::DeviceCount(const seqlib::IntensityFile* blobber) {
+int32_t DeviceOverlap::DeviceCount(const seqlib::IntensityFile* blobber) {
     return blobber != nullptr ? blobber->DeviceCount() : 0;
 }
 

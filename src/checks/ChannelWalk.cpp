@@ -25,13 +25,10 @@ void ReportChannelsFailing(const std::string& sequenceFile, const Message& messa
                 continue;
             if (t == 0 && c == 0 && channel->Name() == "c0")
                 continue;
-            ResumeStep([&] {
-                LibVerify::AddResult(
-                    message,
-                    {"[SEQUENCE]: " + sequenceFile,
-                     "[TRACK]: " + SequenceUtils::TrackText(tracks[t], static_cast<int32_t>(t)),
-                     "[CHANNEL]: " + channel->Name()});
-            });
+            LibVerify::AddResult(message, {"[SEQUENCE]: " + sequenceFile,
+                                           "[TRACK]: " + SequenceUtils::TrackText(
+                                                             tracks[t], static_cast<int32_t>(t)),
+                                           "[CHANNEL]: " + channel->Name()});
         }
     }
 }

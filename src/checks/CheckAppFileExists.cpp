@@ -27,7 +27,7 @@ void CheckAppFileExists::Check() {
         ResumeOr(std::string{}, [&] { return VTRCommon::GetAppPath() + filename_; });
     const bool exists = ResumeOr(false, [&] { return LibFile::FileExists(path); });
     if (!exists) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::AppFileMissing, {path}); });
+        LibVerify::AddResult(Messages::AppFileMissing, {path});
         return;
     }
     ResumeStep([&] {

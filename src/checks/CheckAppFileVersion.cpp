@@ -19,11 +19,9 @@ void CheckAppFileVersion::Check() {
         ResumeOr(std::string{}, [&] { return VTRCommon::GetAppPath() + filename_; });
     const std::string found = ResumeOr(std::string{}, [&] { return FileVersionText(path); });
     if (found != expectedVersion_) {
-        ResumeStep([&] {
-            LibVerify::AddResult(
-                Messages::AppFileUnexpectedVersion,
-                {"[FILE]: " + path, "[EXPECTED]: " + expectedVersion_, "[FOUND]: " + found});
-        });
+        LibVerify::AddResult(
+            Messages::AppFileUnexpectedVersion,
+            {"[FILE]: " + path, "[EXPECTED]: " + expectedVersion_, "[FOUND]: " + found});
     }
 }
 

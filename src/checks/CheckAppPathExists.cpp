@@ -37,10 +37,10 @@ void CheckAppPathExists::Check() {
     const std::string appPath = ResumeOr(std::string{}, [] { return VTRCommon::GetAppPath(); });
     const bool exists = ResumeOr(false, [&] { return LibFile::DirectoryExists(appPath); });
     if (!exists) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::AppDirectoryMissing, {appPath}); });
+        LibVerify::AddResult(Messages::AppDirectoryMissing, {appPath});
         return;
     }
-    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckAppPathMatches>()); });
+    LibVerify::AddCheck(std::make_shared<CheckAppPathMatches>());
     for (const ApplicationFile& file : ApplicationFiles()) {
         ResumeStep([&] {
             auto check = std::make_shared<CheckAppFileExists>();

@@ -25,10 +25,8 @@ void CheckAppPathMatches::Check() {
     const std::string ownFolder = ResumeOr(
         std::string{}, [] { return LibFile::AddTrailingBackslash(VTRCommon::GetProgramFolder()); });
     if (ToLower(appPath) != ToLower(ownFolder)) {
-        ResumeStep([&] {
-            LibVerify::AddResult(Messages::NotRunningFromAppPath,
-                                 {"[APPLICATION]: " + appPath, "[VERIFIER]: " + ownFolder});
-        });
+        LibVerify::AddResult(Messages::NotRunningFromAppPath,
+                             {"[APPLICATION]: " + appPath, "[VERIFIER]: " + ownFolder});
     }
 }
 

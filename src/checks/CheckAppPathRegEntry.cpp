@@ -14,9 +14,9 @@ namespace vtr {
 void CheckAppPathRegEntry::Check() {
     const std::string appPath = ResumeOr(std::string{}, [] { return VTRCommon::GetAppPath(); });
     if (appPath.empty()) {
-        ResumeStep([] { LibVerify::AddResult(Messages::NoAppPathRegEntry); });
+        LibVerify::AddResult(Messages::NoAppPathRegEntry);
     } else {
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckAppPathExists>()); });
+        LibVerify::AddCheck(std::make_shared<CheckAppPathExists>());
     }
 }
 

@@ -42,14 +42,11 @@ void CheckChannelLengthConflicts::Check() {
             const std::size_t first = entry->second;
             if (tracks[first]->Length() == tracks[t]->Length())
                 continue;
-            ResumeStep([&] {
-                LibVerify::AddResult(
-                    Messages::ChannelLengthConflict,
-                    {"[SEQUENCE]: " + filename_, "[CHANNEL]: " + channel->Name(),
-                     "[TRACK]: " +
-                         SequenceUtils::TrackText(tracks[first], static_cast<int32_t>(first)),
-                     "[TRACK]: " + SequenceUtils::TrackText(tracks[t], static_cast<int32_t>(t))});
-            });
+            LibVerify::AddResult(
+                Messages::ChannelLengthConflict,
+                {"[SEQUENCE]: " + filename_, "[CHANNEL]: " + channel->Name(),
+                 "[TRACK]: " + SequenceUtils::TrackText(tracks[first], static_cast<int32_t>(first)),
+                 "[TRACK]: " + SequenceUtils::TrackText(tracks[t], static_cast<int32_t>(t))});
         }
     }
 }

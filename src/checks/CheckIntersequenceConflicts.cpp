@@ -32,6 +32,22 @@ constexpr int32_t kMusical = 8;
 constexpr int32_t kInteractive = 16;
 constexpr int32_t kShutdown = 32;
 
+// The sections that each section is compared with: what the show player runs at the same
+// time. Background sequences run together and under everything; Startup and Shutdown run
+// alone over the Background; the Animation runs with the Musical and Interactive sections,
+// and its own sequences run together only when the Main playlist plays them simultaneously
+// (animation type 2). Pairs of different sections are listed both ways round, so each pair
+// is compared once, from whichever side is walked later.
+constexpr int32_t kEverySection =
+    kBackground | kStartup | kAnimation | kMusical | kInteractive | kShutdown;
+constexpr int32_t kUnderBackground = kBackground;
+constexpr int32_t kWithAnimation = kBackground | kAnimation;
+constexpr int32_t kAnimationInTurn = kBackground | kMusical | kInteractive;
+constexpr int32_t kAnimationTogether = kAnimationInTurn | kAnimation;
+constexpr int32_t kSimultaneousAnimation = 2;
+static_assert(kEverySection == 63 && kAnimationTogether == 29 && kAnimationInTurn == 25 &&
+              kWithAnimation == 5 && kUnderBackground == 1);
+
 int SlotOf(int32_t flag) {
     for (int slot = 0; slot < static_cast<int>(kFlagOrder.size()); ++slot) {
         if (kFlagOrder[slot] == flag)
@@ -68,6 +84,9 @@ struct ChannelRecord {
     int32_t track;
 };
 
+// What the comparison of intensity files hands back with each conflict.
+using Helper = BlobberConflictHelper<const BlobberRecord*, ChannelRecord>;
+
 struct SectionRecord {
     int32_t flag = 0;
     int32_t mask = 0;
@@ -76,7 +95,7 @@ struct SectionRecord {
     std::unordered_map<seqlib::Channel::SettingsId, std::pair<int32_t, int32_t>,
                        seqlib::Channel::SettingsIdHash>
         channels;
-    std::vector<BlobberConflictHelper::Blobber> blobbers;
+    std::vector<Helper::Blobber> blobbers;
 };
 
 class IntersequenceWalk {
@@ -84,12 +103,13 @@ class IntersequenceWalk {
     IntersequenceWalk(const std::string& showFilename, int32_t animationType)
         : filename_(showFilename) {
         const std::array<std::pair<int32_t, int32_t>, 6> masks = {{
-            {kBackground, 63},
-            {kStartup, 1},
-            {kAnimation, animationType == 2 ? 29 : 25},
-            {kMusical, 5},
-            {kInteractive, 5},
-            {kShutdown, 1},
+            {kBackground, kEverySection},
+            {kStartup, kUnderBackground},
+            {kAnimation,
+             animationType == kSimultaneousAnimation ? kAnimationTogether : kAnimationInTurn},
+            {kMusical, kWithAnimation},
+            {kInteractive, kWithAnimation},
+            {kShutdown, kUnderBackground},
         }};
         for (const auto& [flag, mask] : masks) {
             SectionRecord& record = sections_[SlotOf(flag)];
@@ -97,18 +117,15 @@ class IntersequenceWalk {
             record.mask = mask;
         }
         helper_.ChannelConflict =
-            [this](const std::any& blobberContext, const seqlib::DeviceAddress& device,
-                   const std::any& channelContext, const seqlib::Channel& channel) {
-                OnChannelConflict(*std::any_cast<const BlobberRecord*>(blobberContext), device,
-                                  *std::any_cast<const ChannelRecord*>(channelContext), channel);
+            [this](const BlobberRecord* blobber, const seqlib::DeviceAddress& device,
+                   const ChannelRecord& record, const seqlib::Channel& channel) {
+                OnChannelConflict(*blobber, device, record, channel);
             };
-        helper_.BlobberConflict = [this](const std::any& firstContext,
-                                         const seqlib::DeviceAddress& firstDevice,
-                                         const std::any& secondContext,
-                                         const seqlib::DeviceAddress& secondDevice) {
-            OnBlobberConflict(*std::any_cast<const BlobberRecord*>(firstContext), firstDevice,
-                              *std::any_cast<const BlobberRecord*>(secondContext), secondDevice);
-        };
+        helper_.BlobberConflict =
+            [this](const BlobberRecord* first, const seqlib::DeviceAddress& firstDevice,
+                   const BlobberRecord* second, const seqlib::DeviceAddress& secondDevice) {
+                OnBlobberConflict(*first, firstDevice, *second, secondDevice);
+            };
     }
 
     void WalkSequence(int32_t sectionFlag, const std::string& listedName) {
@@ -175,7 +192,7 @@ class IntersequenceWalk {
             for (const auto& blobber : other.blobbers) {
                 bool found = false;
                 ResumeStep([&] {
-                    helper_.CheckForChannelConflicts(blobber, &channel, &channelRecord, found);
+                    helper_.CheckForChannelConflicts(blobber, &channel, channelRecord, found);
                 });
             }
         }
@@ -196,7 +213,7 @@ class IntersequenceWalk {
             return;
         const BlobberRecord& record =
             blobberRecords_.emplace_back(BlobberRecord{section.flag, sequence, kind});
-        const BlobberConflictHelper::Blobber blobber{file.get(), &record};
+        const Helper::Blobber blobber{file.get(), &record};
         for (const int32_t flag : kFlagOrder) {
             if ((section.mask & flag) == 0)
                 continue;
@@ -206,7 +223,7 @@ class IntersequenceWalk {
                 const ChannelRecord channelRecord{other.flag, registration.sequence,
                                                   registration.track};
                 ResumeStep([&] {
-                    helper_.CheckForChannelConflicts(blobber, registration.channel, &channelRecord,
+                    helper_.CheckForChannelConflicts(blobber, registration.channel, channelRecord,
                                                      found);
                 });
             }
@@ -265,7 +282,7 @@ class IntersequenceWalk {
     }
 
     const std::string& filename_;
-    BlobberConflictHelper helper_;
+    Helper helper_;
     std::array<SectionRecord, 6> sections_;
     std::vector<WalkedSequence> walked_;
     std::deque<BlobberRecord> blobberRecords_;  // addresses stay put as it grows

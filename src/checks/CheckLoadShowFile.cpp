@@ -88,10 +88,8 @@ std::vector<ShowReference> CheckLoadShowFile::WalkShow(const Show& show) {
 }
 
 void CheckLoadShowFile::QueueSequenceChecks(const ShowReference& reference) const {
-    ResumeStep([&] {
-        LibVerify::AddCheck(
-            std::make_shared<CheckSequenceFileExists>(reference.sequenceFile, "show " + filename_));
-    });
+    LibVerify::AddCheck(
+        std::make_shared<CheckSequenceFileExists>(reference.sequenceFile, "show " + filename_));
     if (reference.nonAudio) {
         ResumeStep([&] {
             auto nonmusical = std::make_shared<CheckSequenceIsNonmusical>();
@@ -119,7 +117,7 @@ void CheckLoadShowFile::QueueShowChecks() const {
 void CheckLoadShowFile::Check() {
     const ShowPtr show = ResumeOr(ShowPtr{}, [&] { return LibVerify::LoadShow(filename_); });
     if (!show) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::ShowFileUnreadable, {filename_}); });
+        LibVerify::AddResult(Messages::ShowFileUnreadable, {filename_});
         return;
     }
     const auto references = ResumeOr(std::vector<ShowReference>{}, [&] { return WalkShow(*show); });
@@ -127,10 +125,8 @@ void CheckLoadShowFile::Check() {
         if (reference.kind == ShowReference::Kind::Sequence) {
             QueueSequenceChecks(reference);
         } else {
-            ResumeStep([&] {
-                LibVerify::AddCheck(std::make_shared<CheckTriggerDefinedNetwork>(
-                    filename_, reference.trigger, reference.label));
-            });
+            LibVerify::AddCheck(std::make_shared<CheckTriggerDefinedNetwork>(
+                filename_, reference.trigger, reference.label));
         }
     }
     QueueShowChecks();

@@ -14,10 +14,8 @@ std::string CheckMediaFileExists::ReferenceText() const {
 void CheckMediaFileExists::Check() {
     if (ResumeOr(false, [&] { return LibFile::FileExists(filename_); }))
         return;
-    ResumeStep([&] {
-        LibVerify::AddResult(Messages::MediaFileMissing,
-                             {"[FILE]: " + filename_, "[SEQUENCE]: " + inSequenceFile_});
-    });
+    LibVerify::AddResult(Messages::MediaFileMissing,
+                         {"[FILE]: " + filename_, "[SEQUENCE]: " + inSequenceFile_});
 }
 
 std::string CheckMediaFileExists::CheckIdentifier() {

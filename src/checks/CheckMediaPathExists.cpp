@@ -13,7 +13,7 @@ void CheckMediaPathExists::Check() {
         ResumeOr(std::string{}, [&] { return pathService_.GetPath(kMediaDataPath); });
     const bool exists = ResumeOr(false, [&] { return LibFile::DirectoryExists(path); });
     if (!exists)
-        ResumeStep([&] { LibVerify::AddResult(Messages::MediaDirectoryMissing, {path}); });
+        LibVerify::AddResult(Messages::MediaDirectoryMissing, {path});
 }
 
 std::string CheckMediaPathExists::CheckIdentifier() {

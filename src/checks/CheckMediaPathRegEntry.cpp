@@ -14,9 +14,9 @@ void CheckMediaPathRegEntry::Check() {
     const std::string path =
         ResumeOr(std::string{}, [&] { return pathService_.GetPath(kMediaDataPath); });
     if (path.empty()) {
-        ResumeStep([] { LibVerify::AddResult(Messages::NoMediaPathRegEntry); });
+        LibVerify::AddResult(Messages::NoMediaPathRegEntry);
     } else {
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckMediaPathExists>()); });
+        LibVerify::AddCheck(std::make_shared<CheckMediaPathExists>());
     }
 }
 

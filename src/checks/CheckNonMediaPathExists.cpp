@@ -13,7 +13,7 @@ void CheckNonMediaPathExists::Check() {
         ResumeOr(std::string{}, [&] { return pathService_.GetPath(kNonMediaDataPath); });
     const bool exists = ResumeOr(false, [&] { return LibFile::DirectoryExists(path); });
     if (!exists)
-        ResumeStep([&] { LibVerify::AddResult(Messages::NonMediaDirectoryMissing, {path}); });
+        LibVerify::AddResult(Messages::NonMediaDirectoryMissing, {path});
 }
 
 std::string CheckNonMediaPathExists::CheckIdentifier() {

@@ -14,9 +14,9 @@ void CheckNonMediaPathRegEntry::Check() {
     const std::string path =
         ResumeOr(std::string{}, [&] { return pathService_.GetPath(kNonMediaDataPath); });
     if (path.empty()) {
-        ResumeStep([] { LibVerify::AddResult(Messages::NoNonMediaPathRegEntry); });
+        LibVerify::AddResult(Messages::NoNonMediaPathRegEntry);
     } else {
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckNonMediaPathExists>()); });
+        LibVerify::AddCheck(std::make_shared<CheckNonMediaPathExists>());
     }
 }
 

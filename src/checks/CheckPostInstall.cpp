@@ -23,14 +23,14 @@ void CheckPostInstall::Check() {
     const bool done = ResumeOr(
         false, [] { return LibRegistryVTRShared::GetSharedBool("PostInstall", "", false); });
     if (version >= kMinimumPostInstallVersion && done) {
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckAppPathRegEntry>()); });
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckUserDataPathRegEntry>()); });
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckNonMediaPathRegEntry>()); });
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckMediaPathRegEntry>()); });
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckUseCompressedSequences>()); });
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckShowPlayerMemRestarts>()); });
+        LibVerify::AddCheck(std::make_shared<CheckAppPathRegEntry>());
+        LibVerify::AddCheck(std::make_shared<CheckUserDataPathRegEntry>());
+        LibVerify::AddCheck(std::make_shared<CheckNonMediaPathRegEntry>());
+        LibVerify::AddCheck(std::make_shared<CheckMediaPathRegEntry>());
+        LibVerify::AddCheck(std::make_shared<CheckUseCompressedSequences>());
+        LibVerify::AddCheck(std::make_shared<CheckShowPlayerMemRestarts>());
     } else {
-        ResumeStep([] { LibVerify::AddResult(Messages::NotFullyInstalled); });
+        LibVerify::AddResult(Messages::NotFullyInstalled);
     }
 }
 

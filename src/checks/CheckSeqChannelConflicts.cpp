@@ -4,6 +4,7 @@
 #include <unordered_map>
 #include <unordered_set>
 #include <utility>
+#include <variant>
 #include <vector>
 
 #include "checks/BlobberConflictHelper.h"
@@ -45,14 +46,15 @@ void CheckSeqChannelConflicts::Check() {
     if (!sequence)
         return;
 
-    BlobberConflictHelper helper;
+    // An intensity file is known by its kind and track; a channel needs no context.
+    using Helper = BlobberConflictHelper<ConflictContext, std::monostate>;
+    Helper helper;
     ProgressHandler progress;
     progress.SetDescription("Sequence file channel conflicts");
     helper.BlobberCheckDeviceProgress = [&](int32_t) { progress.MakeProgress(1); };
-    helper.ChannelConflict = [&](const std::any& blobberContext,
-                                 const seqlib::DeviceAddress& device, const std::any&,
+    helper.ChannelConflict = [&](const ConflictContext& context,
+                                 const seqlib::DeviceAddress& device, const std::monostate&,
                                  const seqlib::Channel& channel) {
-        const auto& context = std::any_cast<const ConflictContext&>(blobberContext);
         LibVerify::AddResult(
             Messages::SequenceIntensityFileSettingsConflict,
             {"[SEQUENCE]: " + filename_, "[TRACK]: " + context.TrackName(),
@@ -60,10 +62,8 @@ void CheckSeqChannelConflicts::Check() {
              "[RANGE]: " + SequenceUtils::DescribeDeviceAddress(device)});
     };
     helper.BlobberConflict =
-        [&](const std::any& firstContext, const seqlib::DeviceAddress& firstDevice,
-            const std::any& secondContext, const seqlib::DeviceAddress& secondDevice) {
-            const auto& first = std::any_cast<const ConflictContext&>(firstContext);
-            const auto& second = std::any_cast<const ConflictContext&>(secondContext);
+        [&](const ConflictContext& first, const seqlib::DeviceAddress& firstDevice,
+            const ConflictContext& second, const seqlib::DeviceAddress& secondDevice) {
             LibVerify::AddResult(
                 Messages::IntensityFileSettingsConflict,
                 {"[SEQUENCE]: " + filename_, "[INTENSITY FILE]: " + first.BlobberName(),
@@ -76,7 +76,7 @@ void CheckSeqChannelConflicts::Check() {
     const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence);
 
     // The files present, Gridcraft first, each with the kind and the track that carries it.
-    std::vector<BlobberConflictHelper::Blobber> blobbers;
+    std::vector<Helper::Blobber> blobbers;
     for (const auto kind :
          {seqlib::IntensityFileKind::Gridcraft, seqlib::IntensityFileKind::Novalux}) {
         const auto file = sequence->IntensityFileOf(kind);
@@ -136,8 +136,7 @@ void CheckSeqChannelConflicts::Check() {
         }
         ResumeStep([&] {
             helper.CheckForBlobberConflicts(
-                blobbers[b], std::span<const BlobberConflictHelper::Blobber>(blobbers).subspan(b),
-                found);
+                blobbers[b], std::span<const Helper::Blobber>(blobbers).subspan(b), found);
         });
     }
 }

@@ -41,21 +41,17 @@ std::string CheckSequenceFileExists::ReferenceText() const {
 
 void CheckSequenceFileExists::Check() {
     if (!ResumeOr(false, [&] { return LibFile::FileExists(filename_); })) {
-        ResumeStep([&] {
-            LibVerify::AddResult(Messages::SequenceFileMissing,
-                                 {"[SEQUENCE]: " + filename_, "[SHOW]: " + referencedIn_});
-        });
+        LibVerify::AddResult(Messages::SequenceFileMissing,
+                             {"[SEQUENCE]: " + filename_, "[SHOW]: " + referencedIn_});
         return;
     }
     if (IsEditFile(filename_)) {
         // The newer format is never loaded here: only the file it plays is checked.
         const std::string playback =
             ResumeOr(std::string(), [&] { return SequenceUtils::GetR9PlaybackFile(filename_); });
-        ResumeStep([&] {
-            LibVerify::AddCheck(std::make_shared<CheckMediaFileExists>(playback, filename_));
-        });
+        LibVerify::AddCheck(std::make_shared<CheckMediaFileExists>(playback, filename_));
     } else {
-        ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckSequenceLoads>(filename_)); });
+        LibVerify::AddCheck(std::make_shared<CheckSequenceLoads>(filename_));
     }
 }
 

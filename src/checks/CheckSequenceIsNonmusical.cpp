@@ -46,11 +46,9 @@ void CheckSequenceIsNonmusical::Check() {
     // Musical sequences are the "lms" files.
     if (LowerExtension(filename_) != "lms")
         return;
-    ResumeStep([&] {
-        LibVerify::AddResult(
-            Messages::MusicalInNonAudioSection,
-            {"[SEQUENCE]: " + filename_, "[SHOW]: " + inShowFile_, "[SECTION]: " + inShowSection_});
-    });
+    LibVerify::AddResult(
+        Messages::MusicalInNonAudioSection,
+        {"[SEQUENCE]: " + filename_, "[SHOW]: " + inShowFile_, "[SECTION]: " + inShowSection_});
 }
 
 std::string CheckSequenceIsNonmusical::CheckIdentifier() {

@@ -28,7 +28,7 @@ void CheckSequenceLoads::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
                                    [&] { return LibVerify::LoadSequence(filename_); });
     if (!sequence) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_}); });
+        LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_});
         return;
     }
 
@@ -40,12 +40,12 @@ void CheckSequenceLoads::Check() {
             [&] { LibVerify::AddCheck(std::make_shared<CheckMediaFileExists>(media, filename_)); });
     }
 
-    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckSequenceHasEvents>(filename_)); });
-    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckSeqChannelConflicts>(filename_)); });
-    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckChannelsHaveEvents>(filename_)); });
+    LibVerify::AddCheck(std::make_shared<CheckSequenceHasEvents>(filename_));
+    LibVerify::AddCheck(std::make_shared<CheckSeqChannelConflicts>(filename_));
+    LibVerify::AddCheck(std::make_shared<CheckChannelsHaveEvents>(filename_));
     ResumeStep(
         [&] { LibVerify::AddCheck(std::make_shared<CheckChannelsHaveSettings>(filename_)); });
-    ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckUsedNetworksDefined>(filename_)); });
+    LibVerify::AddCheck(std::make_shared<CheckUsedNetworksDefined>(filename_));
     ResumeStep(
         [&] { LibVerify::AddCheck(std::make_shared<CheckChannelLengthConflicts>(filename_)); });
 
@@ -56,17 +56,15 @@ void CheckSequenceLoads::Check() {
     for (const auto& track : sequence->Tracks()) {
         for (const auto& channel : track->Channels()) {
             if (channel->IsSubsequence() && !channel->SubsequenceFile().empty()) {
-                ResumeStep([&] {
-                    LibVerify::AddCheck(std::make_shared<CheckSequenceFileExists>(
-                        channel->SubsequenceFile(), referencedIn));
-                });
+                LibVerify::AddCheck(std::make_shared<CheckSequenceFileExists>(
+                    channel->SubsequenceFile(), referencedIn));
             }
         }
     }
 
     if (sequence->UsesShellCommands()) {
-        ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandMapExists>()); });
-        ResumeStep([&] { LibVerify::AddCheck(std::make_shared<CheckShellCommandSet>(filename_)); });
+        LibVerify::AddCheck(std::make_shared<CheckShellCommandMapExists>());
+        LibVerify::AddCheck(std::make_shared<CheckShellCommandSet>(filename_));
     }
 }
 

@@ -13,7 +13,7 @@ void CheckShellCommandMapExists::Check() {
         ResumeOr(std::string(), [] { return seqlib::ShellCommandMap().MapFilePath(); });
     if (ResumeOr(false, [&] { return LibFile::FileExists(path); }))
         return;
-    ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandMapMissing, {path}); });
+    LibVerify::AddResult(Messages::ShellCommandMapMissing, {path});
 }
 
 std::string CheckShellCommandMapExists::CheckIdentifier() {

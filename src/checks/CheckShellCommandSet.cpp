@@ -22,7 +22,7 @@ void CheckShellCommandSet::Check() {
         ResumeOr(std::string(), [&] { return LibVerify::ShellCommandText(identifier); });
     if (!command.empty())
         return;
-    ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandNotSet, {filename_}); });
+    LibVerify::AddResult(Messages::ShellCommandNotSet, {filename_});
 }
 
 }  // namespace vtr

@@ -23,7 +23,7 @@ void CheckShowFileExists::Check() {
             LibVerify::AddCheck(load);
         });
     } else {
-        ResumeStep([&] { LibVerify::AddResult(Messages::ShowFileMissing, {filename_}); });
+        LibVerify::AddResult(Messages::ShowFileMissing, {filename_});
     }
 }
 

@@ -34,7 +34,7 @@ void CheckShowHasSequence::Check() {
     // A show that cannot be loaded has no sequence either.
     if (show && ResumeOr(false, [&] { return HasSequence(*show); }))
         return;
-    ResumeStep([&] { LibVerify::AddResult(Messages::ShowHasNoSequences, {filename_}); });
+    LibVerify::AddResult(Messages::ShowHasNoSequences, {filename_});
 }
 
 }  // namespace vtr

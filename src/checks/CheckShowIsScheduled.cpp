@@ -52,7 +52,7 @@ void CheckShowIsScheduled::Check() {
     }
 
     if (!found)
-        ResumeStep([] { LibVerify::AddResult(Messages::NoShowsScheduled); });
+        LibVerify::AddResult(Messages::NoShowsScheduled);
 }
 
 std::string CheckShowIsScheduled::CheckIdentifier() {

@@ -13,7 +13,7 @@ void CheckShowPlayerMemRestarts::Check() {
         return LibRegistryVTRShared::GetSharedBool("MonitorRestart", "MonitorMemory", true);
     });
     if (!enabled)
-        ResumeStep([] { LibVerify::AddResult(Messages::MemoryRestartsDisabled); });
+        LibVerify::AddResult(Messages::MemoryRestartsDisabled);
 }
 
 std::string CheckShowPlayerMemRestarts::CheckIdentifier() {

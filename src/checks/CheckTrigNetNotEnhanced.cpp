@@ -25,12 +25,10 @@ void CheckTrigNetNotEnhanced::Check() {
         false, [&] { return LibVerify::GetNetworkPreferences().VTRNetwork(network).Enhanced(); });
     if (!enhanced)
         return;
-    ResumeStep([&] {
-        LibVerify::AddResult(
-            Messages::TriggerUsesEnhancedNetwork,
-            {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
-             "[TRIGGER] " + triggerDescription_});
-    });
+    LibVerify::AddResult(
+        Messages::TriggerUsesEnhancedNetwork,
+        {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
+         "[TRIGGER] " + triggerDescription_});
 }
 
 }  // namespace vtr

@@ -29,18 +29,14 @@ void CheckTriggerDefinedNetwork::Check() {
         return static_cast<int32_t>(LibVerify::GetNetworkPreferences().VTRNetwork(network).Port());
     });
     if (port == 0) {
-        ResumeStep([&] {
-            LibVerify::AddResult(
-                Messages::TriggerUndefinedNetwork,
-                {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
-                 "[TRIGGER] " + triggerDescription_});
-        });
+        LibVerify::AddResult(
+            Messages::TriggerUndefinedNetwork,
+            {"[SHOW] " + showFilename_, "[NETWORK] " + SequenceUtils::VtrNetworkText(network),
+             "[TRIGGER] " + triggerDescription_});
         return;
     }
-    ResumeStep([&] {
-        LibVerify::AddCheck(
-            std::make_shared<CheckTrigNetNotEnhanced>(showFilename_, trig_, triggerDescription_));
-    });
+    LibVerify::AddCheck(
+        std::make_shared<CheckTrigNetNotEnhanced>(showFilename_, trig_, triggerDescription_));
 }
 
 }  // namespace vtr

@@ -13,7 +13,7 @@ void CheckUseCompressedSequences::Check() {
         return LibRegistryVTRShared::GetSharedBool("UseCompressedSequences", "", true);
     });
     if (!enabled)
-        ResumeStep([] { LibVerify::AddResult(Messages::CompressedSequencesDisabled); });
+        LibVerify::AddResult(Messages::CompressedSequencesDisabled);
 }
 
 std::string CheckUseCompressedSequences::CheckIdentifier() {

@@ -56,13 +56,11 @@ void CheckUsedNetworksDefined::Check() {
                 continue;  // already seen through another track that shares it
             if (IsNetworkDefined(preferences, channel->DeviceType(), channel->Network()))
                 continue;
-            ResumeStep([&] {
-                LibVerify::AddResult(
-                    Messages::ChannelUndefinedNetwork,
-                    {"[SEQUENCE]: " + filename_,
-                     "[TRACK]: " + SequenceUtils::TrackText(tracks[t], static_cast<int32_t>(t)),
-                     "[CHANNEL]: " + channel->Name()});
-            });
+            LibVerify::AddResult(
+                Messages::ChannelUndefinedNetwork,
+                {"[SEQUENCE]: " + filename_,
+                 "[TRACK]: " + SequenceUtils::TrackText(tracks[t], static_cast<int32_t>(t)),
+                 "[CHANNEL]: " + channel->Name()});
         }
     }
 
@@ -75,13 +73,11 @@ void CheckUsedNetworksDefined::Check() {
         for (const seqlib::DeviceAddress& device : file->Devices()) {
             if (IsNetworkDefined(preferences, device.DeviceType(), device.Network()))
                 continue;
-            ResumeStep([&] {
-                LibVerify::AddResult(
-                    Messages::IntensityFileUndefinedNetwork,
-                    {"[SEQUENCE]: " + filename_, "[INTENSITY FILE]: " + BlobberKindName(kind),
-                     "[NETWORK]: " +
-                         SequenceUtils::NetworkText(device.DeviceType(), device.Network())});
-            });
+            LibVerify::AddResult(
+                Messages::IntensityFileUndefinedNetwork,
+                {"[SEQUENCE]: " + filename_, "[INTENSITY FILE]: " + BlobberKindName(kind),
+                 "[NETWORK]: " +
+                     SequenceUtils::NetworkText(device.DeviceType(), device.Network())});
         }
     }
 }

@@ -18,12 +18,12 @@ void CheckUserDataPathExists::Check() {
     const std::string path = ResumeOr(std::string{}, [] { return VTRCommon::GetUserDataPath(); });
     const bool exists = ResumeOr(false, [&] { return LibFile::DirectoryExists(path); });
     if (!exists) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::UserDataDirectoryMissing, {path}); });
+        LibVerify::AddResult(Messages::UserDataDirectoryMissing, {path});
         return;
     }
-    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckWeeklyScheduleExists>()); });
-    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckYearlyScheduleExists>()); });
-    ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckShowIsScheduled>()); });
+    LibVerify::AddCheck(std::make_shared<CheckWeeklyScheduleExists>());
+    LibVerify::AddCheck(std::make_shared<CheckYearlyScheduleExists>());
+    LibVerify::AddCheck(std::make_shared<CheckShowIsScheduled>());
 }
 
 std::string CheckUserDataPathExists::CheckIdentifier() {

@@ -14,9 +14,9 @@ namespace vtr {
 void CheckUserDataPathRegEntry::Check() {
     const std::string path = ResumeOr(std::string{}, [] { return VTRCommon::GetUserDataPath(); });
     if (path.empty()) {
-        ResumeStep([] { LibVerify::AddResult(Messages::NoUserDataPathRegEntry); });
+        LibVerify::AddResult(Messages::NoUserDataPathRegEntry);
     } else {
-        ResumeStep([] { LibVerify::AddCheck(std::make_shared<CheckUserDataPathExists>()); });
+        LibVerify::AddCheck(std::make_shared<CheckUserDataPathExists>());
     }
 }
 

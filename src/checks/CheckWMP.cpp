@@ -12,7 +12,7 @@ void CheckWMP::Check() {
     const bool supported =
         ResumeOr(false, [] { return MediaPlayerProbe::IsVersionAtLeast(kMinimumMajorVersion); });
     if (!supported)
-        ResumeStep([] { LibVerify::AddResult(Messages::UnsupportedMediaPlayer); });
+        LibVerify::AddResult(Messages::UnsupportedMediaPlayer);
 }
 
 std::string CheckWMP::CheckIdentifier() {

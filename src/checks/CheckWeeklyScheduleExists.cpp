@@ -12,7 +12,7 @@ void CheckWeeklyScheduleExists::Check() {
     const std::string file =
         ResumeOr(std::string{}, [] { return LibVerify::VerifiedWeeklyScheduleFile(); });
     if (!ResumeOr(false, [&] { return LibFile::FileExists(file); }))
-        ResumeStep([&] { LibVerify::AddResult(Messages::WeeklyScheduleMissing, {file}); });
+        LibVerify::AddResult(Messages::WeeklyScheduleMissing, {file});
 }
 
 std::string CheckWeeklyScheduleExists::CheckIdentifier() {

@@ -12,7 +12,7 @@ void CheckYearlyScheduleExists::Check() {
     const std::string file =
         ResumeOr(std::string{}, [] { return LibVerify::VerifiedYearlyScheduleFile(); });
     if (!ResumeOr(false, [&] { return LibFile::FileExists(file); }))
-        ResumeStep([&] { LibVerify::AddResult(Messages::YearlyScheduleMissing, {file}); });
+        LibVerify::AddResult(Messages::YearlyScheduleMissing, {file});
 }
 
 std::string CheckYearlyScheduleExists::CheckIdentifier() {

@@ -22,12 +22,15 @@ constexpr int32_t kVtr = 1;
 constexpr int32_t kX10 = 3;
 constexpr int32_t kDmx = 7;
 
+// Each side of a conflict is named by a text of the test's own.
+using Helper = BlobberConflictHelper<std::string, std::string>;
+
 class DevicesConflictTest : public ::testing::Test {
   protected:
     bool Conflict(const DeviceAddress& a, const DeviceAddress& b) const {
         return helper.DevicesConflict(a, b);
     }
-    BlobberConflictHelper helper;
+    DeviceOverlap helper;
 };
 
 TEST_F(DevicesConflictTest, DmxUniversesSeparateDevicesAndTheSameUniverseComparesCircuits) {
@@ -85,19 +88,16 @@ TEST_F(DevicesConflictTest, ARangePast32767IsAnOverflow) {
 class HelperEventsTest : public ::testing::Test {
   protected:
     HelperEventsTest() {
-        helper.BlobberConflict = [this](const std::any& a, const DeviceAddress& da,
-                                        const std::any& b, const DeviceAddress& db) {
-            events.push_back(std::any_cast<std::string>(a) + " " +
-                             SequenceUtils::DescribeDeviceAddress(da) + " / " +
-                             std::any_cast<std::string>(b) + " " +
+        helper.BlobberConflict = [this](const std::string& a, const DeviceAddress& da,
+                                        const std::string& b, const DeviceAddress& db) {
+            events.push_back(a + " " + SequenceUtils::DescribeDeviceAddress(da) + " / " + b + " " +
                              SequenceUtils::DescribeDeviceAddress(db));
         };
-        helper.ChannelConflict = [this](const std::any& blobber, const DeviceAddress& device,
-                                        const std::any& channelContext,
+        helper.ChannelConflict = [this](const std::string& blobber, const DeviceAddress& device,
+                                        const std::string& channelContext,
                                         const seqlib::Channel& channel) {
-            events.push_back(std::any_cast<std::string>(blobber) + " " +
-                             SequenceUtils::DescribeDeviceAddress(device) + " / " +
-                             std::any_cast<std::string>(channelContext) + " " + channel.Name());
+            events.push_back(blobber + " " + SequenceUtils::DescribeDeviceAddress(device) + " / " +
+                             channelContext + " " + channel.Name());
         };
         helper.BlobberCheckDeviceProgress = [this](int32_t device) {
             events.push_back("progress " + std::to_string(device));
@@ -111,15 +111,15 @@ class HelperEventsTest : public ::testing::Test {
         return file;
     }
 
-    BlobberConflictHelper helper;
+    Helper helper;
     std::vector<std::string> events;
 };
 
 TEST_F(HelperEventsTest, DevicesOfOneFileMeetEachOtherOnceAndNeverThemselves) {
     const IntensityFile file =
         File({{kDmx, 1, 0, 1, 10}, {kDmx, 1, 0, 5, 10}, {kDmx, 1, 0, 100, 1}});
-    const BlobberConflictHelper::Blobber blobber{&file, std::string("G")};
-    const std::vector<BlobberConflictHelper::Blobber> others = {blobber};
+    const Helper::Blobber blobber{&file, std::string("G")};
+    const std::vector<Helper::Blobber> others = {blobber};
     bool found = false;
     helper.CheckForBlobberConflicts(blobber, others, found);
     EXPECT_TRUE(found);
@@ -130,8 +130,8 @@ TEST_F(HelperEventsTest, DevicesOfOneFileMeetEachOtherOnceAndNeverThemselves) {
 TEST_F(HelperEventsTest, EveryConflictingPairWithOtherFilesIsReported) {
     const IntensityFile mine = File({{kDmx, 1, 0, 1, 10}, {kDmx, 2, 0, 1, 10}});
     const IntensityFile theirs = File({{kDmx, 2, 0, 10, 1}, {kDmx, 1, 0, 10, 5}});
-    const std::vector<BlobberConflictHelper::Blobber> others = {{nullptr, std::string("none")},
-                                                                {&theirs, std::string("T")}};
+    const std::vector<Helper::Blobber> others = {{nullptr, std::string("none")},
+                                                 {&theirs, std::string("T")}};
     bool found = false;
     helper.CheckForBlobberConflicts({&mine, std::string("M")}, others, found);
     EXPECT_TRUE(found);
@@ -142,7 +142,7 @@ TEST_F(HelperEventsTest, EveryConflictingPairWithOtherFilesIsReported) {
 TEST_F(HelperEventsTest, NoFileAndNoConflictLeaveFoundAsItWas) {
     const IntensityFile file = File({{kDmx, 1, 0, 1, 10}});
     const IntensityFile apart = File({{kDmx, 3, 0, 1, 10}});
-    const std::vector<BlobberConflictHelper::Blobber> others = {{&apart, std::string("A")}};
+    const std::vector<Helper::Blobber> others = {{&apart, std::string("A")}};
     bool found = false;
     helper.CheckForBlobberConflicts({nullptr, std::string("none")}, others, found);
     EXPECT_TRUE(events.empty());
@@ -152,15 +152,15 @@ TEST_F(HelperEventsTest, NoFileAndNoConflictLeaveFoundAsItWas) {
     found = true;
     helper.CheckForBlobberConflicts({&file, std::string("F")}, others, found);
     EXPECT_TRUE(found);
-    EXPECT_EQ(BlobberConflictHelper::DeviceCount(nullptr), 0);
-    EXPECT_EQ(BlobberConflictHelper::DeviceCount(&file), 1);
+    EXPECT_EQ(DeviceOverlap::DeviceCount(nullptr), 0);
+    EXPECT_EQ(DeviceOverlap::DeviceCount(&file), 1);
 }
 
 TEST_F(HelperEventsTest, AnOverflowEndsTheComparisonAfterTheConflictsAlreadyFound) {
     const IntensityFile file =
         File({{kDmx, 1, 0, 1, 10}, {kDmx, 1, 0, 5, 1}, {kDmx, 1, 0, 32000, 1000}});
-    const BlobberConflictHelper::Blobber blobber{&file, std::string("G")};
-    const std::vector<BlobberConflictHelper::Blobber> others = {blobber};
+    const Helper::Blobber blobber{&file, std::string("G")};
+    const std::vector<Helper::Blobber> others = {blobber};
     bool found = false;
     EXPECT_THROW(helper.CheckForBlobberConflicts(blobber, others, found), VtrError);
     EXPECT_TRUE(found);
