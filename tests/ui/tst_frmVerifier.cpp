@@ -764,9 +764,9 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     QCOMPARE(request.initialFolder, QString::fromStdString(vtr::VTRCommon::GetUserDataPath()));
     QCOMPARE(request.fileName, QStringLiteral("VTRVerifier Results"));
     QCOMPARE(request.defaultExtension, QStringLiteral("txt"));
-    QCOMPARE(
-        request.filters,
-        (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}}}));
+    QCOMPARE(request.filters,
+             (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}},
+                                {QStringLiteral("HTML report"), {QStringLiteral("*.html")}}}));
     QCOMPARE(request.filterIndex, 1);
     QVERIFY(request.promptToOverwrite && request.hideReadOnlyBox && request.pathMustExist &&
             request.refuseReadOnlyFile);
@@ -775,6 +775,18 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
                  std::string(79, '=') +
                  "\r\nMessage Number: 6\r\nSeverity: Error\r\nDescription: Six\r\n"
                  "Detail #1: B\r\nDetail #2: C\r\n");
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // A name ending in .html gets the HTML report of the same results.
+    const std::string page = folder_->File("report.html");
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(page); };
+    Click("cmdSave");
+    const std::string html = vtr::testsupport::ReadFileBytes(page);
+    QVERIFY(html.starts_with("<!DOCTYPE html>"));
+    QVERIFY(html.find("id=\"count-errors\" data-count=\"1\"") != std::string::npos);
+    QVERIFY(html.find("id=\"count-warnings\" data-count=\"1\"") != std::string::npos);
+    QVERIFY(html.find("<span class=\"sm\">Six</span><ul class=\"d\"><li>B</li><li>C</li></ul>") !=
+            std::string::npos);
     QVERIFY(dialogs_->boxes.isEmpty());
 
     // Cancelling the dialog saves nothing.
@@ -792,6 +804,18 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
     QVERIFY(dialogs_->boxes[0].text.startsWith(
         QString::fromStdString("Cannot create the results file " + unwritable)));
+
+    // Never over a file of the suite that the window reads, such as its help file.
+    const std::string helpFile = AppFolder() + "/VTRHelp.chm";
+    vtr::testsupport::WriteFileBytes(helpFile, "help");
+    dialogs_->boxes.clear();
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(helpFile); };
+    Click("cmdSave");
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
+    QVERIFY(dialogs_->boxes[0].text.startsWith(
+        QString::fromStdString("Cannot save the results file as " + helpFile)));
+    QCOMPARE(vtr::testsupport::ReadFileBytes(helpFile), std::string("help"));
 }
 
 void FrmVerifierTest::targetDialogsAndTheirFailures() {
