@@ -34,7 +34,7 @@
 #include <string>
 #include <vector>
 
-#include "checks/CheckIntersequenceConflicts.h"
+#include "checks/conflicts/CheckIntersequenceConflicts.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"

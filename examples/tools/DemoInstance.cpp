@@ -10,8 +10,8 @@
 #include <stdexcept>
 #include <vector>
 
-#include "checks/CheckAppFileExists.h"
-#include "checks/CheckAppPathExists.h"
+#include "checks/installation/CheckAppFileExists.h"
+#include "checks/installation/CheckAppPathExists.h"
 #include "show/Serialize.h"
 #include "vtrsupport/SequenceGenerator.h"
 

@@ -9,9 +9,9 @@
 #include <unordered_set>
 #include <utility>
 
-#include "checks/CheckOldKRP.h"
-#include "checks/CheckPostInstall.h"
-#include "checks/CheckWMP.h"
+#include "checks/installation/CheckOldKRP.h"
+#include "checks/installation/CheckPostInstall.h"
+#include "checks/installation/CheckWMP.h"
 #include "engine/IgnoreLists.h"
 #include "engine/VtrError.h"
 #include "environment/FilesRead.h"

@@ -5,8 +5,8 @@
 #include <memory>
 #include <set>
 
-#include "checks/CheckAppFileExists.h"
-#include "checks/CheckAppPathExists.h"
+#include "checks/installation/CheckAppFileExists.h"
+#include "checks/installation/CheckAppPathExists.h"
 #include "engine/VtrError.h"
 #include "environment/RegistryFile.h"
 #include "schedule/Schedule.h"

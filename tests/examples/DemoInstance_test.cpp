@@ -7,7 +7,7 @@
 #include <map>
 #include <stdexcept>
 
-#include "checks/CheckAppFileExists.h"
+#include "checks/installation/CheckAppFileExists.h"
 #include "environment/FileVersion.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"

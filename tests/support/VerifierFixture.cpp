@@ -2,8 +2,8 @@
 
 #include <filesystem>
 
-#include "checks/CheckAppFileExists.h"
-#include "checks/CheckAppPathExists.h"
+#include "checks/installation/CheckAppFileExists.h"
+#include "checks/installation/CheckAppPathExists.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryFile.h"
 #include "vtrsupport/PeImage.h"
