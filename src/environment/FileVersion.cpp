@@ -133,8 +133,8 @@ std::optional<uint32_t> FindEntry(Reader& file, uint64_t resourceBase, uint32_t 
         return std::nullopt;
     }
     for (uint32_t i = 0; i < count; ++i) {
-        const uint32_t name = Le32(bytes, i * kResourceEntrySize);
-        const uint32_t target = Le32(bytes, i * kResourceEntrySize + 4);
+        const uint32_t name = Le32(bytes, std::size_t{i} * kResourceEntrySize);
+        const uint32_t target = Le32(bytes, std::size_t{i} * kResourceEntrySize + 4);
         if (wantedId && ((name & kNamedEntryFlag) != 0 || name != *wantedId))
             continue;
         if (((target & kSubdirectoryFlag) != 0) != wantSubdirectory)
