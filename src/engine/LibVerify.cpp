@@ -10,11 +10,11 @@
 #include <unordered_set>
 #include <utility>
 
-#include "checks/CheckIntersequenceConflicts.h"
-#include "checks/CheckOldKRP.h"
-#include "checks/CheckPostInstall.h"
-#include "checks/CheckSequenceLoads.h"
-#include "checks/CheckWMP.h"
+#include "checks/conflicts/CheckIntersequenceConflicts.h"
+#include "checks/installation/CheckOldKRP.h"
+#include "checks/installation/CheckPostInstall.h"
+#include "checks/installation/CheckWMP.h"
+#include "checks/sequence/CheckSequenceLoads.h"
 #include "engine/IgnoreLists.h"
 #include "engine/SequencePrefetch.h"
 #include "engine/VtrError.h"
@@ -114,8 +114,8 @@ struct VerificationState {
     YearSchedulePtr yearlySchedule;
     std::string yearlyScheduleFile;
     FileLoadCounts loadCounts;
-    RunInfo selected;  // the target as selected, without the times
-    RunInfo run;       // the target and times of the current (or last) run
+    RunInfo selected;     // the target as selected, without the times
+    RunInfo run;          // the target and times of the current (or last) run
     int loadingJobs = 0;  // 0: every processor
     // Loads sequences ahead of the queue while a run goes, with more than one job.
     std::unique_ptr<SequencePrefetch> prefetch;
@@ -161,19 +161,6 @@ void Broadcast(Operation&& operation) {
 
 constexpr std::size_t kMaxDetails = 9;
 
-// The text of whatever a failed step raised.
-std::string DescribeFailure(const std::exception_ptr& failure) {
-    try {
-        std::rethrow_exception(failure);
-    } catch (const VtrError& error) {
-        return error.Description();
-    } catch (const std::exception& error) {
-        return error.what();
-    } catch (...) {
-        return "Unknown error";
-    }
-}
-
 // How many files the workers load beyond those the checks have taken, per worker: enough
 // to keep them busy while the checks of one file run, few enough to bound the memory of
 // sequences loaded and not yet asked for.
@@ -216,7 +203,7 @@ const std::string& MakeTempFile(std::string& slot, const char* prefix, const cha
     try {
         slot = LibFile::MakeTempFileName(prefix);
     } catch (...) {
-        RaiseTargetError(source, DescribeFailure(std::current_exception()));
+        RaiseTargetError(source, DescribeException(std::current_exception()));
     }
     LibFile::RegisterTempFile(slot);
     return slot;
@@ -244,7 +231,7 @@ void BuildShowTarget(const std::string& showFile) {
                                      WeekTimeFunctions::NewWeekTime(kTargetDay, kTargetEndHour,
                                                                     kTargetMinute, kTargetSecond));
     } catch (...) {
-        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+        RaiseTargetError(kSource, DescribeException(std::current_exception()));
     }
     const std::string& weeklyFile = MakeTempFile(state.tempWeeklyFile, "VTRVer-WS-", kSource);
     if (!ResumeStep([&] { schedule->Save(weeklyFile); }))
@@ -288,35 +275,37 @@ void PostTransientMessage(const std::string& message) {
 }
 
 ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpContextId,
-                    int32_t messageNumber, const std::vector<std::string>& details) {
-    auto result = std::make_shared<Result>();
-    result->SetSeverity(severity);
-    result->SetSummary(summary);
-    result->SetHelpContextID(helpContextId);
-    result->SetMessageNumber(messageNumber);
-    // Empty details leave no gap: a result's details are always consecutive from the first.
-    const std::size_t count = std::min(details.size(), kMaxDetails);
-    for (std::size_t i = 0; i < count; ++i) {
-        if (!details[i].empty())
-            result->AddDetail(details[i]);
-    }
-
-    VerificationState& state = State();
-    if (IsResultIgnored(*result)) {
-        state.ignoredResults.push_back(result);
-    } else {
-        state.results.push_back(result);
-        if (severity == Severity::Error) {
-            state.errors.push_back(result);
-        } else if (severity == Severity::Warning) {
-            state.warnings.push_back(result);
+                    int32_t messageNumber, const std::vector<std::string>& details) noexcept {
+    return ResumeOr(ResultPtr{}, [&] {
+        auto result = std::make_shared<Result>();
+        result->SetSeverity(severity);
+        result->SetSummary(summary);
+        result->SetHelpContextID(helpContextId);
+        result->SetMessageNumber(messageNumber);
+        // Empty details leave no gap: a result's details are always consecutive from the first.
+        const std::size_t count = std::min(details.size(), kMaxDetails);
+        for (std::size_t i = 0; i < count; ++i) {
+            if (!details[i].empty())
+                result->AddDetail(details[i]);
         }
-    }
-    Broadcast([&](INotificationClient& client) { client.ResultAdded(result); });
-    return result;
+
+        VerificationState& state = State();
+        if (IsResultIgnored(*result)) {
+            state.ignoredResults.push_back(result);
+        } else {
+            state.results.push_back(result);
+            if (severity == Severity::Error) {
+                state.errors.push_back(result);
+            } else if (severity == Severity::Warning) {
+                state.warnings.push_back(result);
+            }
+        }
+        Broadcast([&](INotificationClient& client) { client.ResultAdded(result); });
+        return result;
+    });
 }
 
-ResultPtr AddResult(const Message& message, const std::vector<std::string>& details) {
+ResultPtr AddResult(const Message& message, const std::vector<std::string>& details) noexcept {
     return AddResult(message.severity, message.summary, message.helpContextId, message.number,
                      details);
 }
@@ -384,7 +373,7 @@ void VerifySequenceFile(const std::string& sequenceFile) {
     try {
         text = ShowFunctions::ShowToText(show);
     } catch (...) {
-        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+        RaiseTargetError(kSource, DescribeException(std::current_exception()));
     }
     const std::string& showFile = MakeTempFile(state.tempShowFile, "VTRVer-Show-", kSource);
     if (WriteWholeFile(showFile, text) != 0)
@@ -444,9 +433,9 @@ void BeginVerification() {
     });
     ResumeStep([] { IgnoreLists::LoadIgnoreLists(); });
 
-    ResumeStep([] { AddCheck(std::make_shared<CheckPostInstall>()); });
-    ResumeStep([] { AddCheck(std::make_shared<CheckWMP>()); });
-    ResumeStep([] { AddCheck(std::make_shared<CheckOldKRP>()); });
+    AddCheck(std::make_shared<CheckPostInstall>());
+    AddCheck(std::make_shared<CheckWMP>());
+    AddCheck(std::make_shared<CheckOldKRP>());
 }
 
 void RunVerification() {
@@ -504,7 +493,7 @@ void CancelVerification() {
     state.cancelled = true;
     if (state.prefetch)
         state.prefetch->Stop();
-    ResumeStep([] { AddResult(Messages::VerificationCancelled); });
+    AddResult(Messages::VerificationCancelled);
     while (!state.pendingChecks.Empty())
         state.pendingChecks.RemoveFront();
     Broadcast([](INotificationClient& client) { client.VerificationCancelled(); });
@@ -531,23 +520,25 @@ bool IsCancelled() {
 
 // --- Services for checks -----------------------------------------------------------------------
 
-void AddCheck(CheckPtr check) {
-    VerificationState& state = State();
-    if (state.cancelled || !check)
-        return;
-    std::string id = check->CheckIdentifier();
-    if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
-        return;
-    state.pendingChecks.Append(std::move(id), check);
-    if (state.prefetch) {
-        ResumeStep([&] {
-            for (const std::string& file : SequenceFilesOf(*check, state)) {
-                if (!file.empty() && state.sequenceCache.count(file) == 0)
-                    state.prefetch->Want(file);
-            }
-        });
-    }
-    Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
+void AddCheck(CheckPtr check) noexcept {
+    ResumeStep([&] {
+        VerificationState& state = State();
+        if (state.cancelled || !check)
+            return;
+        std::string id = check->CheckIdentifier();
+        if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
+            return;
+        state.pendingChecks.Append(std::move(id), check);
+        if (state.prefetch) {
+            ResumeStep([&] {
+                for (const std::string& file : SequenceFilesOf(*check, state)) {
+                    if (!file.empty() && state.sequenceCache.count(file) == 0)
+                        state.prefetch->Want(file);
+                }
+            });
+        }
+        Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
+    });
 }
 
 std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
@@ -568,14 +559,14 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
             SequenceLoader::TellProgress(fileName, percent);
         sequence = std::move(loaded->sequence);
         if (loaded->failure)
-            failure = DescribeFailure(loaded->failure);
+            failure = DescribeException(loaded->failure);
     } else {
         try {
             SequenceLoader loader;
             sequence = loader.Load(fileName);
         } catch (...) {
             sequence = nullptr;
-            failure = DescribeFailure(std::current_exception());
+            failure = DescribeException(std::current_exception());
         }
     }
     // Kept even when empty: a file that cannot be loaded is not tried again in this run.
