@@ -28,7 +28,9 @@ void CheckSequenceLoads::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
                                    [&] { return LibVerify::LoadSequence(filename_); });
     if (!sequence) {
-        ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_}); });
+        // A cancellation that stopped the load says nothing of the file.
+        if (!LibVerify::IsCancelled())
+            ResumeStep([&] { LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_}); });
         return;
     }
 

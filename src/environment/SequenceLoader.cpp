@@ -9,16 +9,45 @@ SequenceLoader::~SequenceLoader() {
     sequence_ = nullptr;
 }
 
+namespace {
+
+// The verification under way was cancelled (the flag outlives its run).
+bool RunCancelled() {
+    return LibVerify::IsVerifying() && LibVerify::IsCancelled();
+}
+
+}  // namespace
+
 std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileName) {
+    if (RunCancelled())
+        return nullptr;
     fileName_ = fileName;
     sequence_ = std::make_shared<seqlib::Sequence>();
-    sequence_->Load(fileName, [this](int32_t percent) { OnProgress(percent); });
+    lastPump_ = std::chrono::steady_clock::now();
+    seqlib::LoadOptions options;
+    options.keepGoing = [this] { return KeepGoing(); };
+    options.pollInterval = kPumpInterval / 2;
+    if (!sequence_->Load(
+            fileName, [this](int32_t percent) { OnProgress(percent); }, options)) {
+        return nullptr;
+    }
     return sequence_;
+}
+
+void SequenceLoader::Pump() {
+    LibVerify::ProcessPendingEvents();
+    lastPump_ = std::chrono::steady_clock::now();
 }
 
 void SequenceLoader::OnProgress(int32_t percent) {
     LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName_);
-    LibVerify::ProcessPendingEvents();
+    Pump();
+}
+
+bool SequenceLoader::KeepGoing() {
+    if (std::chrono::steady_clock::now() - lastPump_ >= kPumpInterval)
+        Pump();
+    return !RunCancelled();
 }
 
 }  // namespace vtr

@@ -497,21 +497,62 @@ std::string LoadErrorText(const std::string& fileName, const detail::LoadFailure
 
 }  // namespace
 
-void Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
+namespace {
+
+// Keeps a load's promise to ask, at least once per interval of its work, whether to go on.
+class LoadClock {
+  public:
+    explicit LoadClock(const LoadOptions& options)
+        : keepGoing_(options.keepGoing),
+          interval_(options.pollInterval),
+          last_(std::chrono::steady_clock::now()) {}
+
+    // Asks when the interval has passed since the last question.
+    void Tick() {
+        if (keepGoing_ && std::chrono::steady_clock::now() - last_ >= interval_)
+            Ask();
+    }
+
+    void Ask() {
+        if (!keepGoing_)
+            return;
+        last_ = std::chrono::steady_clock::now();
+        if (!keepGoing_())
+            throw detail::LoadStopped{};
+    }
+
+  private:
+    const std::function<bool()>& keepGoing_;
+    std::chrono::steady_clock::duration interval_;
+    std::chrono::steady_clock::time_point last_;
+};
+
+}  // namespace
+
+bool Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
                     const LoadOptions& options) {
     Sequence loaded;
     loaded.fileName_ = fileName;
     try {
+        LoadClock clock(options);
         const auto source = detail::OpenDecodedFile(fileName, options.maxExpandedBytes);
         int32_t told = -1;
+        // The caller may have let its user cancel while it was told (a load that is done
+        // stays done).
         const auto tell = [&](int32_t percent) {
             if (progress && percent > told) {
                 told = percent;
                 progress(percent);
+                if (percent < 100)
+                    clock.Ask();
             }
         };
         tell(0);
-        detail::XmlPieceReader reader(*source, options.pieceBytes);
+        detail::XmlPieceReader::Options readerOptions;
+        readerOptions.pieceBytes = options.pieceBytes;
+        readerOptions.maxDepth = options.maxDepth;
+        readerOptions.tick = [&clock] { clock.Tick(); };
+        detail::XmlPieceReader reader(*source, std::move(readerOptions));
         SequenceBuilder builder(loaded, reader);
         reader.Run(builder, [&] {
             const std::uint64_t total = source->FileBytesTotal();
@@ -522,6 +563,8 @@ void Sequence::Load(const std::string& fileName, const ProgressCallback& progres
         });
         builder.Finish();
         tell(100);
+    } catch (const detail::LoadStopped&) {
+        return false;
     } catch (const detail::LoadFailure& failure) {
         Raise(ErrorNumbers::UserMessage, "Sequence.Load", LoadErrorText(fileName, failure));
     } catch (const std::bad_alloc&) {
@@ -529,6 +572,7 @@ void Sequence::Load(const std::string& fileName, const ProgressCallback& progres
               LoadErrorText(fileName, {{}, "not enough memory to load it"}));
     }
     *this = std::move(loaded);
+    return true;
 }
 
 }  // namespace vtr::seqlib
