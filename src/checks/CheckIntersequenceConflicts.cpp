@@ -3,8 +3,6 @@
 #include <array>
 #include <deque>
 #include <memory>
-#include <unordered_map>
-#include <unordered_set>
 #include <vector>
 
 #include <utility>
@@ -16,6 +14,7 @@
 #include "engine/VtrError.h"
 #include "environment/LibFile.h"
 #include "environment/SequenceUtils.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/Sequence.h"
 #include "show/Show.h"
 
@@ -73,9 +72,7 @@ struct SectionRecord {
     int32_t mask = 0;
     // Every registration in the order made; per key, the first and the last of its chain.
     std::vector<Registration> registrations;
-    std::unordered_map<seqlib::Channel::SettingsId, std::pair<int32_t, int32_t>,
-                       seqlib::Channel::SettingsIdHash>
-        channels;
+    seqlib::SettingsMap<std::pair<int32_t, int32_t>> channels;
     std::vector<BlobberConflictHelper::Blobber> blobbers;
 };
 
@@ -128,7 +125,7 @@ class IntersequenceWalk {
         SectionRecord& section = sections_[SlotOf(sectionFlag)];
 
         const auto& tracks = walked.Tracks();
-        std::unordered_set<const seqlib::Channel*> inEarlierTracks;
+        seqlib::ChannelMap<bool> inEarlierTracks(walked.Channels().size());
         for (std::size_t t = 0; t < tracks.size(); ++t) {
             for (const auto& channel : tracks[t]->Channels()) {
                 ResumeStep([&] {
@@ -137,7 +134,7 @@ class IntersequenceWalk {
             }
             if (t + 1 < tracks.size()) {
                 for (const auto& channel : tracks[t]->Channels())
-                    inEarlierTracks.insert(channel.get());
+                    inEarlierTracks.Insert(channel.get(), true);
             }
         }
 
@@ -150,11 +147,11 @@ class IntersequenceWalk {
   private:
     void WalkChannel(SectionRecord& section, int32_t sequence, int32_t track,
                      const seqlib::Channel& channel,
-                     const std::unordered_set<const seqlib::Channel*>& inEarlierTracks) {
+                     const seqlib::ChannelMap<bool>& inEarlierTracks) {
         if (!channel.HasPhysicalSettings())
             return;
         // A channel shared by several tracks of one sequence counts once, with its first.
-        if (inEarlierTracks.count(&channel) != 0)
+        if (inEarlierTracks.Find(&channel) != nullptr)
             return;
         const seqlib::Channel::SettingsId key = channel.SettingsIdentity();
         const ChannelRecord channelRecord{section.flag, sequence, track};
@@ -162,9 +159,8 @@ class IntersequenceWalk {
             if ((section.mask & flag) == 0)
                 continue;
             SectionRecord& other = sections_[SlotOf(flag)];
-            const auto found = other.channels.find(key);
-            if (found != other.channels.end()) {
-                for (int32_t r = found->second.first; r >= 0; r = other.registrations[r].next) {
+            if (const auto* found = other.channels.Find(key)) {
+                for (int32_t r = found->first; r >= 0; r = other.registrations[r].next) {
                     const Registration registration = other.registrations[r];
                     ResumeStep([&] {
                         ReportChannelConflict(section.flag, sequence, track, channel, other.flag,
@@ -182,10 +178,10 @@ class IntersequenceWalk {
         // Registered after the comparison, so that a channel never meets itself.
         const auto index = static_cast<int32_t>(section.registrations.size());
         section.registrations.push_back({sequence, track, &channel, -1});
-        const auto [entry, isNew] = section.channels.try_emplace(key, index, index);
+        const auto [entry, isNew] = section.channels.Insert(key, {index, index});
         if (!isNew) {
-            section.registrations[entry->second.second].next = index;
-            entry->second.second = index;
+            section.registrations[entry->second].next = index;
+            entry->second = index;
         }
     }
 

@@ -19,7 +19,7 @@ CutFinder::CutFinder(TextWindow& window, MarkupLexer& lexer, const LineCounter& 
 
 void CutFinder::Start(int64_t at) {
     scan_ = boundary_ = at;
-    ahead_.clear();
+    ClearAhead();
 }
 
 CutFinder::Cut CutFinder::Piece(int64_t at) {
@@ -28,11 +28,11 @@ CutFinder::Cut CutFinder::Piece(int64_t at) {
 
 CutFinder::Cut CutFinder::TextEnds(int64_t pos) {
     const int64_t end = window_.End();
-    if (ahead_.empty() && end == pos)
+    if (NoneAhead() && end == pos)
         return {CutKind::EndOfData, end, {}};
     // What is left goes to the parser, which refuses an element left open or a markup item
     // cut short; the reader then finds the end of the data.
-    ahead_.clear();
+    ClearAhead();
     scan_ = boundary_ = end;
     return Piece(end);
 }
@@ -41,7 +41,7 @@ CutFinder::Cut CutFinder::Next(int64_t pos, std::size_t openDepth) {
     const int64_t limit = pos + pieceBytes_;
     for (;;) {
         int64_t stop = limit;
-        if (ahead_.empty()) {
+        if (NoneAhead()) {
             if (scan_ >= limit) {
                 if (boundary_ > pos)
                     return Piece(boundary_);
@@ -49,7 +49,7 @@ CutFinder::Cut CutFinder::Next(int64_t pos, std::size_t openDepth) {
                 return Piece(limit);
             }
         } else {
-            const Ahead& first = ahead_.front();
+            const Ahead& first = ahead_[first_];
             stop = std::min(limit, first.start + descendBytes_);
             if (scan_ >= stop) {
                 // The element does not end soon enough (or the piece is full): what comes
@@ -58,7 +58,13 @@ CutFinder::Cut CutFinder::Next(int64_t pos, std::size_t openDepth) {
                     return Piece(boundary_);
                 const Cut enter{CutKind::Descend, first.start, {Markup::StartTag, first.tagEnd}};
                 boundary_ = first.boundary;
-                ahead_.pop_front();
+                if (++first_ == ahead_.size()) {
+                    ClearAhead();
+                } else if (first_ >= 1024 && first_ * 2 >= ahead_.size()) {
+                    ahead_.erase(ahead_.begin(),
+                                 ahead_.begin() + static_cast<std::ptrdiff_t>(first_));
+                    first_ = 0;
+                }
                 return enter;
             }
         }
@@ -77,15 +83,17 @@ CutFinder::Cut CutFinder::Next(int64_t pos, std::size_t openDepth) {
             case Markup::Truncated:
                 return TextEnds(pos);
             case Markup::EndTag:
-                if (ahead_.empty()) {
+                if (NoneAhead()) {
                     scan_ = boundary_ = item.end;
                     return {CutKind::EndTag, lt, item};
                 }
                 ahead_.pop_back();
+                if (NoneAhead())
+                    ClearAhead();
                 break;
             case Markup::StartTag:
             case Markup::EmptyTag:
-                if (openDepth + ahead_.size() + 1 > maxDepth_) {
+                if (openDepth + (ahead_.size() - first_) + 1 > maxDepth_) {
                     lines_.FailAt(lt, "the elements are nested more than " +
                                           std::to_string(maxDepth_) + " levels deep");
                 }

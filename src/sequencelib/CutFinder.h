@@ -2,7 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <deque>
+#include <vector>
 
 #include "sequencelib/MarkupLexer.h"
 
@@ -57,8 +57,13 @@ class CutFinder {
         int64_t boundary;
     };
 
+    bool NoneAhead() const { return first_ == ahead_.size(); }
     // The last boundary at the level being read.
-    int64_t& Boundary() { return ahead_.empty() ? boundary_ : ahead_.back().boundary; }
+    int64_t& Boundary() { return NoneAhead() ? boundary_ : ahead_.back().boundary; }
+    void ClearAhead() {
+        ahead_.clear();
+        first_ = 0;
+    }
     Cut Piece(int64_t at);
     Cut TextEnds(int64_t pos);
 
@@ -71,7 +76,10 @@ class CutFinder {
 
     int64_t scan_ = 0;      // where reading goes on
     int64_t boundary_ = 0;  // the last node boundary in the innermost open element
-    std::deque<Ahead> ahead_;
+    // The elements started ahead, outermost first, from ahead_[first_] on (entering the
+    // outermost one moves first_ on).
+    std::vector<Ahead> ahead_;
+    std::size_t first_ = 0;
 };
 
 }  // namespace vtr::seqlib::detail

@@ -1,5 +1,6 @@
 #include "sequencelib/MarkupLexer.h"
 
+#include "sequencelib/ByteScan.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/TextPlaces.h"
 #include "sequencelib/TextWindow.h"
@@ -60,29 +61,22 @@ Lexed MarkupLexer::LexItem(int64_t at) {
 
 Lexed MarkupLexer::LexStartTag(int64_t at) {
     int64_t j = at + 1;
+    char quote = 0;  // inside a quoted value: its quote
     for (;;) {
-        // The held bytes are scanned directly; a quote skips to its partner.
-        const char* b = window_.At(j);
+        // The held bytes are searched directly; more are read when they run out.
+        const char* const start = window_.At(j);
         const char* const end = window_.At(window_.End());
-        const char* p = b;
-        while (p < end && *p != '>' && *p != '"' && *p != '\'')
-            ++p;
-        j += p - b;
-        if (p == end) {
-            if (j >= stop_)
-                TooLong();
-            if (!window_.ReadMore())
-                return {};
-            continue;
-        }
-        if (*p == '>') {
+        const char* const p = FindTagEnd(start, end, quote);
+        if (p != end) {
+            j += p - start;
             const bool empty = j > at + 1 && window_[j - 1] == '/';
             return {empty ? Markup::EmptyTag : Markup::StartTag, j + 1};
         }
-        const Lexed quoted = Until(Markup::StartTag, j + 1, *p);
-        if (quoted.kind == Markup::Truncated)
+        j = window_.End();
+        if (j >= stop_)
+            TooLong();
+        if (!window_.ReadMore())
             return {};
-        j = quoted.end;
     }
 }
 

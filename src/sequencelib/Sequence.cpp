@@ -6,10 +6,10 @@
 #include <limits>
 #include <new>
 #include <string_view>
-#include <unordered_map>
 
 #include "engine/VtrError.h"
 #include "sequencelib/ByteSource.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/XmlPieceReader.h"
 
@@ -209,10 +209,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         const auto& channels = sequence_.Channels();
         std::size_t index = lastFound_ + lastStride_;
         if (index >= channels.size() || channels[index]->Id() != id) {
-            const auto found = indexById_.find(id);
-            if (found == indexById_.end())
+            const std::size_t* found = indexById_.Find(id);
+            if (found == nullptr)
                 return kNoChannel;
-            index = found->second;
+            index = *found;
         }
         lastStride_ = index > lastFound_ ? index - lastFound_ : 1;
         lastFound_ = index;
@@ -240,20 +240,23 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
 
     int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
                   int64_t max) const {
-        // Digits, with a minus sign in front for a negative number; nothing else.
+        // Digits, with a minus sign in front for a negative number; nothing else. Every range
+        // is within 32 bits, so a value that passes 10^15 is out of it whatever follows.
+        constexpr int64_t kOutOfEveryRange = 1000000000000000;
         const char* text = attribute.value();
         const char* p = text;
         const bool negative = *p == '-';
-        if (negative)
-            ++p;
-        int64_t value = 0;
+        p += negative ? 1 : 0;
         bool valid = *p != '\0';
+        int64_t value = 0;
         for (; *p != '\0'; ++p) {
-            if (*p < '0' || *p > '9' || value > (INT64_MAX - 9) / 10) {
+            const auto digit = static_cast<unsigned>(static_cast<unsigned char>(*p) - '0');
+            if (digit > 9) {
                 valid = false;
                 break;
             }
-            value = value * 10 + (*p - '0');
+            if (value < kOutOfEveryRange)
+                value = value * 10 + digit;
         }
         if (negative)
             value = -value;
@@ -329,7 +332,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         if (!idAttribute || *idAttribute.value() == '\0')
             Fail(element, "the <channel> has no id");
         auto channel = std::make_shared<Channel>(idAttribute.value());
-        if (!indexById_.try_emplace(std::string_view(channel->Id()), sequence_.Channels().size())
+        if (!indexById_.Insert(std::string_view(channel->Id()), sequence_.Channels().size())
                  .second) {
             Fail(idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
         }
@@ -475,8 +478,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     Sequence& sequence_;
     const detail::XmlPieceReader& reader_;
     std::vector<Context> stack_;
-    // Each channel's index in the sequence, by id.
-    std::unordered_map<std::string_view, std::size_t, ChannelIdHash> indexById_;
+    // Each channel's index in the sequence, by id (viewing the channel's own copy).
+    FlatMap<std::string_view, std::size_t, ChannelIdHash> indexById_;
     std::size_t lastFound_ = 0;
     std::size_t lastStride_ = 1;
     Channel* channel_ = nullptr;

@@ -1,9 +1,11 @@
 #include "sequencelib/TextPlaces.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstring>
 #include <string_view>
 
+#include "sequencelib/ByteScan.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/TextWindow.h"
 
@@ -11,21 +13,18 @@ namespace vtr::seqlib::detail {
 
 namespace {
 
-// The number of '\n' bytes, eight at a time.
+// The number of '\n' bytes, sixteen at a time where the processor allows.
 int64_t CountNewlines(const char* p, std::size_t n) {
-    constexpr uint64_t kNewlines = 0x0A0A0A0A0A0A0A0Aull;
-    constexpr uint64_t kLow7 = 0x7F7F7F7F7F7F7F7Full;
     int64_t count = 0;
     std::size_t i = 0;
-    for (; i + 8 <= n; i += 8) {
-        uint64_t word;
-        std::memcpy(&word, p + i, 8);
-        const uint64_t x = word ^ kNewlines;  // a zero byte where there is a newline
-        const uint64_t nonzero = ((x & kLow7) + kLow7) | x;
-        // One bit (the top one) per newline byte; gather them into the low byte.
-        const uint64_t marks = ~(nonzero | kLow7) >> 7;
-        count += static_cast<int64_t>((marks * 0x0101010101010101ull) >> 56);
+#ifdef VTR_SCAN_SSE2
+    const __m128i newline = _mm_set1_epi8('\n');
+    for (; i + 16 <= n; i += 16) {
+        const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i));
+        count +=
+            std::popcount(static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(v, newline))));
     }
+#endif
     for (; i < n; ++i)
         count += p[i] == '\n';
     return count;

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cstring>
 
+#include "sequencelib/ByteScan.h"
+
 namespace vtr::seqlib::detail {
 
 TextWindow::TextWindow(ByteSource& source, std::size_t readBytes, std::function<void()> afterRead)
@@ -22,7 +24,8 @@ void TextWindow::MakeRoom() {
         size_ = held;
         return;
     }
-    std::size_t grown = std::max<std::size_t>(capacity_, readBytes_);
+    // Room for a few blocks, so that what is held moves to the front once in a while.
+    std::size_t grown = std::max<std::size_t>(capacity_, 4 * readBytes_);
     while (grown - held < readBytes_)
         grown *= 2;
     grown = std::max(grown, held + readBytes_);
@@ -63,16 +66,11 @@ int64_t TextWindow::Find(int64_t from, char c, int64_t stop) {
     while (i < stop) {
         const int64_t end = std::min(End(), stop);
         if (i < end) {
-            // Markup is dense: the byte is usually near, where a call costs more than a look.
-            const char* start = At(i);
+            const char* const start = At(i);
             const char* const last = start + (end - i);
-            const char* const near = start + std::min<int64_t>(end - i, 16);
-            for (const char* p = start; p < near; ++p) {
-                if (*p == c)
-                    return i + (p - start);
-            }
-            if (const void* hit = std::memchr(near, c, static_cast<std::size_t>(last - near)))
-                return i + (static_cast<const char*>(hit) - start);
+            const char* const hit = FindByte(start, last, c);
+            if (hit != last)
+                return i + (hit - start);
             i = end;
         }
         if (i >= stop || !ReadMore())
