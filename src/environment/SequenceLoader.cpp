@@ -23,10 +23,9 @@ std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileNa
         return nullptr;
     fileName_ = fileName;
     sequence_ = std::make_shared<seqlib::Sequence>();
-    lastPump_ = std::chrono::steady_clock::now();
     seqlib::LoadOptions options;
     options.keepGoing = [this] { return KeepGoing(); };
-    options.pollInterval = kPumpInterval / 2;
+    options.pollInterval = kPumpInterval;
     if (!sequence_->Load(
             fileName, [this](int32_t percent) { OnProgress(percent); }, options)) {
         return nullptr;
@@ -34,19 +33,18 @@ std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileNa
     return sequence_;
 }
 
-void SequenceLoader::Pump() {
-    LibVerify::ProcessPendingEvents();
-    lastPump_ = std::chrono::steady_clock::now();
-}
-
 void SequenceLoader::OnProgress(int32_t percent) {
     LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName_);
-    Pump();
+    LibVerify::ProcessPendingEvents();
+    justPumped_ = true;
 }
 
+// Asked after each percent (whose text has just let the user interface in) and after
+// kPumpInterval of work without one.
 bool SequenceLoader::KeepGoing() {
-    if (std::chrono::steady_clock::now() - lastPump_ >= kPumpInterval)
-        Pump();
+    if (!justPumped_)
+        LibVerify::ProcessPendingEvents();
+    justPumped_ = false;
     return !RunCancelled();
 }
 

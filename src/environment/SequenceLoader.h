@@ -12,14 +12,14 @@ namespace vtr {
 // Loads one sequence and turns its progress into status text: "Loading " n "% of " and
 // the file, sent to the notification clients, after which the user interface processes
 // its pending events (so a Cancel click is seen during a long load). Between percents the
-// user interface still gets its turn at least every kPumpInterval of loading, and a
-// cancelled verification stops the load. The loader calls the driver's notifications and
+// user interface still gets its turn at least every kPumpInterval of the load's work, and
+// a cancelled verification stops the load. The loader calls the driver's notifications and
 // pump, so it runs on the driver's thread.
 class SequenceLoader {
   public:
-    // The longest the user interface waits for its turn while a sequence loads, give or
-    // take one step of the load.
-    static constexpr std::chrono::milliseconds kPumpInterval{50};
+    // The longest the load works without giving the user interface its turn, give or take
+    // one step of the load.
+    static constexpr std::chrono::milliseconds kPumpInterval{40};
 
     SequenceLoader() = default;
     ~SequenceLoader();
@@ -34,11 +34,10 @@ class SequenceLoader {
   private:
     void OnProgress(int32_t percent);
     bool KeepGoing();
-    void Pump();
 
     std::shared_ptr<seqlib::Sequence> sequence_;
     std::string fileName_;
-    std::chrono::steady_clock::time_point lastPump_;
+    bool justPumped_ = false;
 };
 
 }  // namespace vtr

@@ -10,6 +10,7 @@
 #include "engine/VtrError.h"
 #include "sequencelib/ByteSource.h"
 #include "sequencelib/FlatMap.h"
+#include "sequencelib/LoadClock.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/XmlPieceReader.h"
 
@@ -500,44 +501,12 @@ std::string LoadErrorText(const std::string& fileName, const detail::LoadFailure
 
 }  // namespace
 
-namespace {
-
-// Keeps a load's promise to ask, at least once per interval of its work, whether to go on.
-class LoadClock {
-  public:
-    explicit LoadClock(const LoadOptions& options)
-        : keepGoing_(options.keepGoing),
-          interval_(options.pollInterval),
-          last_(std::chrono::steady_clock::now()) {}
-
-    // Asks when the interval has passed since the last question.
-    void Tick() {
-        if (keepGoing_ && std::chrono::steady_clock::now() - last_ >= interval_)
-            Ask();
-    }
-
-    void Ask() {
-        if (!keepGoing_)
-            return;
-        last_ = std::chrono::steady_clock::now();
-        if (!keepGoing_())
-            throw detail::LoadStopped{};
-    }
-
-  private:
-    const std::function<bool()>& keepGoing_;
-    std::chrono::steady_clock::duration interval_;
-    std::chrono::steady_clock::time_point last_;
-};
-
-}  // namespace
-
 bool Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
                     const LoadOptions& options) {
     Sequence loaded;
     loaded.fileName_ = fileName;
     try {
-        LoadClock clock(options);
+        detail::LoadClock clock(options.keepGoing, options.pollInterval);
         const auto source = detail::OpenDecodedFile(fileName, options.maxExpandedBytes);
         int32_t told = -1;
         // The caller may have let its user cancel while it was told (a load that is done

@@ -35,7 +35,7 @@ struct LoadOptions {
     // Elements nested deeper than this are refused.
     int32_t maxDepth = kMaxNestingDepth;
     // Asked as the load goes, after each percent told and at least once per pollInterval
-    // of work in between: false stops the load.
+    // of work in between (the loading thread's processor time): false stops the load.
     std::function<bool()> keepGoing;
     std::chrono::milliseconds pollInterval{50};
 };
