@@ -43,23 +43,19 @@
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
+#include "support/ChildRun.h"
 #include "support/PeImage.h"
 #include "support/SequenceBenchSupport.h"
 #include "vtrgen/InstallationGenerator.h"
 
 #if defined(__unix__)
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/resource.h>
-#include <sys/wait.h>
-#include <unistd.h>
 #define VTR_BENCH_CHILD_PROCESS 1
-extern char** environ;
 #endif
 
 namespace {
 
 using namespace vtr;
+using bench::ChildRun;
 using Clock = std::chrono::steady_clock;
 
 // The installation's size: sequences of a three-minute show, a thousand events per channel
@@ -81,14 +77,6 @@ constexpr int32_t kDoublingSequences = 12;
 double ProcessorSeconds() {
     return static_cast<double>(std::clock()) / CLOCKS_PER_SEC;
 }
-
-// What one run of the verifier cost.
-struct ChildRun {
-    double wallSeconds = 0;
-    double processorSeconds = 0;
-    std::uint64_t peakBytes = 0;
-    int status = -1;
-};
 
 struct Fixture {
     bench::BenchFolder folder;
@@ -178,75 +166,11 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 #if defined(VTR_BENCH_CHILD_PROCESS) && defined(VTR_VERIFY_PROGRAM)
 
-// Runs the program with its output thrown away and waits for it. Its peak resident set is
-// its own only when this process is small: a process started from a large one is charged
-// the large one's resident set too. So the benchmark measures through a fresh copy of
-// itself (RunMeasuredIfAsked), started before it has read anything.
-std::optional<ChildRun> SpawnAndWait(std::vector<std::string> args) {
-    std::vector<char*> argv;
-    for (std::string& arg : args)
-        argv.push_back(arg.data());
-    argv.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
-    posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
-    const auto start = Clock::now();
-    pid_t pid = 0;
-    const int spawned = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (spawned != 0)
-        return std::nullopt;
-    int waitStatus = 0;
-    struct rusage usage {};
-    if (wait4(pid, &waitStatus, 0, &usage) != pid)
-        return std::nullopt;
-    ChildRun run;
-    run.wallSeconds = std::chrono::duration<double>(Clock::now() - start).count();
-    run.processorSeconds =
-        static_cast<double>(usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) +
-        static_cast<double>(usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e6;
-    run.peakBytes = static_cast<std::uint64_t>(usage.ru_maxrss) * 1024;
-    run.status = WIFEXITED(waitStatus) ? WEXITSTATUS(waitStatus) : -1;
-    return run;
-}
-
-// The measuring copy's side: `--run-measured PROGRAM ARGS...` runs the program and prints
-// its figures.
-bool RunMeasuredIfAsked(int argc, char** argv) {
-    if (argc < 3 || std::strcmp(argv[1], "--run-measured") != 0)
-        return false;
-    const auto run = SpawnAndWait(std::vector<std::string>(argv + 2, argv + argc));
-    if (run) {
-        std::printf("%.6f %.6f %llu %d\n", run->wallSeconds, run->processorSeconds,
-                    static_cast<unsigned long long>(run->peakBytes), run->status);
-    }
-    return true;
-}
-
-// Runs the program through a measuring copy of this benchmark.
-std::optional<ChildRun> Measure(const std::vector<std::string>& programArgs) {
-    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
-    std::string command = "'" + self + "' --run-measured";
-    for (const std::string& arg : programArgs)
-        command += " '" + arg + "'";
-    std::FILE* measuring = popen(command.c_str(), "r");
-    if (measuring == nullptr)
-        return std::nullopt;
-    ChildRun run;
-    unsigned long long peak = 0;
-    const int read = std::fscanf(measuring, "%lf %lf %llu %d", &run.wallSeconds,
-                                 &run.processorSeconds, &peak, &run.status);
-    if (pclose(measuring) != 0 || read != 4)
-        return std::nullopt;
-    run.peakBytes = peak;
-    return run;
-}
-
 void BM_VerifyEntireSchedule(benchmark::State& state) {
     for (auto _ : state) {
-        const auto run = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                  fixture->installation.registryFile, "--format", "json"});
+        const auto run =
+            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                 fixture->installation.registryFile, "--format", "json"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -256,7 +180,7 @@ void BM_VerifyEntireSchedule(benchmark::State& state) {
             fixture->child = run;
         fixture->childPeakBytes = std::max(fixture->childPeakBytes, run->peakBytes);
     }
-    if (const auto baseline = Measure({VTR_VERIFY_PROGRAM, "--version"}))
+    if (const auto baseline = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--version"}))
         fixture->baselinePeakBytes = baseline->peakBytes;
     if (fixture->child) {
         state.counters["cpu_ms"] = fixture->child->processorSeconds * 1e3;
@@ -274,10 +198,10 @@ void BM_PeakPerChannel(benchmark::State& state) {
     const auto smaller = Install("small", small);
     const auto larger = Install("large", large);
     for (auto _ : state) {
-        const auto a = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                smaller.registryFile, "--format", "json"});
-        const auto b = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry", larger.registryFile,
-                                "--format", "json"});
+        const auto a = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                            smaller.registryFile, "--format", "json"});
+        const auto b = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                            larger.registryFile, "--format", "json"});
         if (!a || !b) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -293,12 +217,6 @@ void BM_PeakPerChannel(benchmark::State& state) {
     }
 }
 BENCHMARK(BM_PeakPerChannel)->UseManualTime()->Iterations(1)->Unit(benchmark::kMillisecond);
-
-#else
-
-bool RunMeasuredIfAsked(int, char**) {
-    return false;
-}
 
 #endif
 
@@ -428,7 +346,7 @@ std::string Milliseconds(double a, double b) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    if (RunMeasuredIfAsked(argc, argv))
+    if (bench::RunMeasuredIfAsked(argc, argv))
         return 0;
     TakeSizeOptions(argc, argv);
     benchmark::Initialize(&argc, argv);

@@ -70,10 +70,15 @@ struct ChannelRecord {
 struct SectionRecord {
     int32_t flag = 0;
     int32_t mask = 0;
-    // Every registration in the order made; per key, the first and the last of its chain.
+    // Every registration in the order made, chained per address.
     std::vector<Registration> registrations;
-    seqlib::SettingsMap<std::pair<int32_t, int32_t>> channels;
     std::vector<BlobberConflictHelper::Blobber> blobbers;
+};
+
+// The registrations at one address in each section: the first and the last of the chain.
+struct AddressChains {
+    std::array<std::pair<int32_t, int32_t>, kFlagOrder.size()> chains;
+    AddressChains() { chains.fill({-1, -1}); }
 };
 
 class IntersequenceWalk {
@@ -153,20 +158,24 @@ class IntersequenceWalk {
         // A channel shared by several tracks of one sequence counts once, with its first.
         if (inEarlierTracks.Find(&channel) != nullptr)
             return;
-        const seqlib::Channel::SettingsId key = channel.SettingsIdentity();
+        // One look-up for every section: the chains of the channel's address.
+        const auto [at, isNew] =
+            addresses_.Insert(channel.SettingsIdentity(), static_cast<int32_t>(chains_.size()));
+        if (isNew)
+            chains_.emplace_back();
+        const int32_t chainsAt = *at;
         const ChannelRecord channelRecord{section.flag, sequence, track};
-        for (const int32_t flag : kFlagOrder) {
-            if ((section.mask & flag) == 0)
+        for (std::size_t slot = 0; slot < kFlagOrder.size(); ++slot) {
+            if ((section.mask & kFlagOrder[slot]) == 0)
                 continue;
-            SectionRecord& other = sections_[SlotOf(flag)];
-            if (const auto* found = other.channels.Find(key)) {
-                for (int32_t r = found->first; r >= 0; r = other.registrations[r].next) {
-                    const Registration registration = other.registrations[r];
-                    ResumeStep([&] {
-                        ReportChannelConflict(section.flag, sequence, track, channel, other.flag,
-                                              registration);
-                    });
-                }
+            SectionRecord& other = sections_[slot];
+            for (int32_t r = chains_[chainsAt].chains[slot].first; r >= 0;
+                 r = other.registrations[r].next) {
+                const Registration registration = other.registrations[r];
+                ResumeStep([&] {
+                    ReportChannelConflict(section.flag, sequence, track, channel, other.flag,
+                                          registration);
+                });
             }
             for (const auto& blobber : other.blobbers) {
                 bool found = false;
@@ -178,11 +187,13 @@ class IntersequenceWalk {
         // Registered after the comparison, so that a channel never meets itself.
         const auto index = static_cast<int32_t>(section.registrations.size());
         section.registrations.push_back({sequence, track, &channel, -1});
-        const auto [entry, isNew] = section.channels.Insert(key, {index, index});
-        if (!isNew) {
-            section.registrations[entry->second].next = index;
-            entry->second = index;
+        auto& [first, last] = chains_[chainsAt].chains[SlotOf(section.flag)];
+        if (first < 0) {
+            first = index;
+        } else {
+            section.registrations[last].next = index;
         }
+        last = index;
     }
 
     void CompareIntensityFile(SectionRecord& section, int32_t sequence,
@@ -262,7 +273,10 @@ class IntersequenceWalk {
 
     const std::string& filename_;
     BlobberConflictHelper helper_;
-    std::array<SectionRecord, 6> sections_;
+    std::array<SectionRecord, kFlagOrder.size()> sections_;
+    // The chains of each address met, found by the address.
+    seqlib::SettingsMap<int32_t> addresses_;
+    std::vector<AddressChains> chains_;
     std::vector<WalkedSequence> walked_;
     std::deque<BlobberRecord> blobberRecords_;  // addresses stay put as it grows
 };

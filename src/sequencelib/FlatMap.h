@@ -14,9 +14,9 @@ namespace vtr::seqlib {
 // A hash map in one flat array (open addressing, linear probing), for looking up every
 // channel of a sequence by its id, its object or its address: one allocation for the whole
 // map instead of one per entry, and entries side by side in memory. Entries are added,
-// never removed; the array doubles when it is half full. The key's hash is spread over the
-// array by a Fibonacci multiplication, so keys whose hash differs only in high bits (object
-// addresses) spread as well as any.
+// never removed; the array doubles when it is half full. An entry's place is the low bits
+// of its key's hash, so the hash must spread keys there (ids 1, 2, 3... hashed as their
+// value fill the array in order, which keeps a large file's index in the cache).
 template <typename Key, typename Value, typename Hash>
 class FlatMap {
   public:
@@ -55,8 +55,7 @@ class FlatMap {
     // The slot that holds the key, or the free one where it goes.
     Slot& SlotOf(const Key& key) {
         const std::size_t mask = slots_.size() - 1;
-        std::size_t i = static_cast<std::size_t>(
-            (static_cast<std::uint64_t>(Hash{}(key)) * 0x9E3779B97F4A7C15ull) >> shift_);
+        std::size_t i = Hash{}(key)&mask;
         while (slots_[i].used && !(slots_[i].key == key))
             i = (i + 1) & mask;
         return slots_[i];
@@ -65,7 +64,6 @@ class FlatMap {
     void Rehash(std::size_t capacity) {
         std::vector<Slot> old = std::move(slots_);
         slots_.assign(capacity, Slot{});
-        shift_ = 64 - std::countr_zero(capacity);
         for (const Slot& slot : old) {
             if (slot.used)
                 SlotOf(slot.key) = slot;
@@ -74,13 +72,15 @@ class FlatMap {
 
     std::vector<Slot> slots_;
     std::size_t size_ = 0;
-    int shift_ = 64;
 };
 
-// Channel objects, by their address.
+// Channel objects, by their address (mixed: addresses share their low bits).
 struct ChannelAddressHash {
     std::size_t operator()(const Channel* channel) const noexcept {
-        return reinterpret_cast<std::uintptr_t>(channel);
+        auto x = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(channel));
+        x = (x ^ (x >> 30)) * 0xBF58476D1CE4E5B9ull;
+        x = (x ^ (x >> 27)) * 0x94D049BB133111EBull;
+        return static_cast<std::size_t>(x ^ (x >> 31));
     }
 };
 template <typename Value>

@@ -6,6 +6,7 @@
 #include <limits>
 #include <new>
 #include <string_view>
+#include <utility>
 
 #include "engine/VtrError.h"
 #include "sequencelib/ByteSource.h"
@@ -116,14 +117,15 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::TextPlace place;
     };
 
-    // The name equals the literal (compared up to and with its terminating NUL).
+    // The name equals the literal (compared up to and with its terminating NUL, a byte at a
+    // time so that nothing past a shorter name is read; unrolled for the literal at hand).
     template <std::size_t N>
     static bool Is(const char* name, const char (&literal)[N]) {
-        for (std::size_t i = 0; i < N; ++i) {
-            if (name[i] != literal[i])
-                return false;
-        }
-        return true;
+        return IsEach(name, literal, std::make_index_sequence<N>{});
+    }
+    template <std::size_t N, std::size_t... I>
+    static bool IsEach(const char* name, const char (&literal)[N], std::index_sequence<I...>) {
+        return ((name[I] == literal[I]) && ...);
     }
 
     void Walk(Context parent, const pugi::xml_node& element) {
@@ -232,41 +234,40 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     // Marks a known attribute as read; a second one of the same name is refused.
     void Once(unsigned& seen, unsigned bit, const pugi::xml_attribute& attribute,
               const char* element) const {
-        if ((seen & bit) != 0) {
-            Fail(attribute, std::string("the attribute ") + attribute.name() + " of <" + element +
-                                "> is repeated");
-        }
+        if ((seen & bit) != 0)
+            FailRepeated(attribute, element);
         seen |= bit;
     }
+    [[noreturn]] void FailRepeated(const pugi::xml_attribute& attribute, const char* element) const;
 
+    // The attribute's whole number, which must lie in [min, max].
     int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
                   int64_t max) const {
-        // Digits, with a minus sign in front for a negative number; nothing else. Every range
-        // is within 32 bits, so a value that passes 10^15 is out of it whatever follows.
-        constexpr int64_t kOutOfEveryRange = 1000000000000000;
-        const char* text = attribute.value();
-        const char* p = text;
-        const bool negative = *p == '-';
-        p += negative ? 1 : 0;
-        bool valid = *p != '\0';
         int64_t value = 0;
-        for (; *p != '\0'; ++p) {
-            const auto digit = static_cast<unsigned>(static_cast<unsigned char>(*p) - '0');
-            if (digit > 9) {
-                valid = false;
-                break;
-            }
-            if (value < kOutOfEveryRange)
-                value = value * 10 + digit;
-        }
-        if (negative)
-            value = -value;
-        if (!valid || value < min || value > max) {
-            Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + text +
-                                "\" of <" + element + "> is not a whole number from " +
-                                std::to_string(min) + " to " + std::to_string(max));
-        }
+        if (!ReadWhole(attribute.value(), value) || value < min || value > max)
+            FailNumber(attribute, element, min, max);
         return value;
+    }
+    [[noreturn]] void FailNumber(const pugi::xml_attribute& attribute, const char* element,
+                                 int64_t min, int64_t max) const;
+
+    // Digits, with a minus sign in front for a negative number; nothing else. Leading zeros
+    // count for nothing; every range is within 32 bits, so a number of more than fifteen
+    // digits after them is out of it and is not read on.
+    static bool ReadWhole(const char* text, int64_t& value) {
+        const bool negative = *text == '-';
+        const char* p = text + (negative ? 1 : 0);
+        const char* const digits = p;
+        while (*p == '0')
+            ++p;
+        const char* const significant = p;
+        int64_t read = 0;
+        for (unsigned digit;
+             (digit = static_cast<unsigned char>(*p) - 0x30u) <= 9 && p - significant < 15; ++p) {
+            read = read * 10 + digit;
+        }
+        value = negative ? -read : read;
+        return *p == '\0' && p != digits;
     }
 
     static constexpr int64_t kLongMax = std::numeric_limits<int32_t>::max();
@@ -489,6 +490,19 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     IntensityFile* intensityFile_ = nullptr;
     std::vector<PendingReference> pending_;
 };
+
+void SequenceBuilder::FailRepeated(const pugi::xml_attribute& attribute,
+                                   const char* element) const {
+    Fail(attribute,
+         std::string("the attribute ") + attribute.name() + " of <" + element + "> is repeated");
+}
+
+void SequenceBuilder::FailNumber(const pugi::xml_attribute& attribute, const char* element,
+                                 int64_t min, int64_t max) const {
+    Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + attribute.value() +
+                        "\" of <" + element + "> is not a whole number from " +
+                        std::to_string(min) + " to " + std::to_string(max));
+}
 
 namespace {
 
