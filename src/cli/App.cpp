@@ -3,18 +3,23 @@
 #include <exception>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <ostream>
 #include <string>
 #include <system_error>
 #include <vector>
 
+#include "Baseline.h"
 #include "IgnoreCommands.h"
 #include "Interrupt.h"
+#include "ReportFile.h"
 #include "ResultsOutput.h"
+#include "Terminal.h"
 #include "engine/LibVerify.h"
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
 #include "engine/VtrError.h"
+#include "environment/OutputFile.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
 
@@ -96,24 +101,19 @@ class ScopedEventPump {
     ScopedEventPump& operator=(const ScopedEventPump&) = delete;
 };
 
-bool SameFile(const std::string& a, const std::string& b) {
-    std::error_code error;
-    return !a.empty() && !b.empty() && fs::equivalent(fs::path(a), fs::path(b), error) && !error;
-}
+// The temporary files of the selected target go with the run, however it ends: normally,
+// cancelled, or by an error escaping (at the program's end the driver's state removes them
+// too, and a second Ctrl-C removes them in its handler).
+class TempFilesRemover {
+  public:
+    TempFilesRemover() = default;
+    ~TempFilesRemover() { LibVerify::DeleteTempFiles(); }
+    TempFilesRemover(const TempFilesRemover&) = delete;
+    TempFilesRemover& operator=(const TempFilesRemover&) = delete;
+};
 
-// What the run must not overwrite with its report: the target and the settings store.
-std::vector<std::string> ProtectedFiles(const Options& options) {
-    std::vector<std::string> files;
-    if (options.target == TargetKind::Schedule) {
-        files.push_back(VTRCommon::GetWeeklyScheduleFile());
-        files.push_back(VTRCommon::GetYearlyScheduleFile());
-    } else {
-        files.push_back(options.targetFile);
-    }
-    if (auto store = RegistryStore::CurrentFile())
-        files.push_back(*store);
-    return files;
-}
+constexpr const char* kReportWhat = "results file";
+constexpr const char* kReportSource = "vantori-verify";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -133,11 +133,6 @@ std::string SetUpProblem(const Options& options) {
         if (!fs::is_directory(folder, error))
             return "cannot write the results report " + *options.output +
                    ": its folder does not exist";
-        for (const std::string& file : ProtectedFiles(options)) {
-            if (SameFile(*options.output, file))
-                return "the results report " + *options.output +
-                       " would overwrite a file of the suite";
-        }
     }
     return {};
 }
@@ -175,6 +170,14 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, problem);
         return ExitStatus::CannotSetUp;
     }
+    std::optional<Baseline> baseline;
+    try {
+        if (options.baseline)
+            baseline = Baseline::Read(*options.baseline);
+    } catch (const VtrError& error) {
+        Fail(console.err, error.Description());
+        return ExitStatus::CannotSetUp;
+    }
 
     std::unique_ptr<ProgressLine> progress;
     if (console.errIsTerminal && !options.quiet)
@@ -193,13 +196,20 @@ int RunVerify(const Options& givenOptions, Console& console) {
     if (options.log)
         logging = std::make_unique<ScopedClient>(&logWriter);
 
-    // Ctrl-C from here on only asks for a cancellation, which the pump passes on between two
-    // steps of the run; the driver then removes its temporary files as at any other end.
+    // Ctrl-C (and SIGTERM, a hang-up, a closed output) from here on only asks for a
+    // cancellation, which the pump passes on as soon as it runs: between two checks, and
+    // inside long checks and sequence loads as they report progress. The driver then removes
+    // its temporary files as at any other end; a second Ctrl-C removes them and ends at once.
     auto interrupts = std::make_unique<InterruptGuard>();
     bool cancelRequested = false;
     ScopedEventPump pump([&] {
-        if (InterruptGuard::Requested() && !cancelRequested && LibVerify::IsVerifying()) {
+        const Interruption interruption = InterruptGuard::Requested();
+        if (interruption != Interruption::None && !cancelRequested && LibVerify::IsVerifying()) {
             cancelRequested = true;
+            if (progress)
+                progress->Erase();
+            Fail(console.err, CancellingNotice(interruption));
+            console.err.flush();
             LibVerify::CancelVerification();
         }
         if (progress) {
@@ -209,8 +219,12 @@ int RunVerify(const Options& givenOptions, Console& console) {
         }
     });
 
+    TempFilesRemover removeTempFiles;
     try {
         SelectTarget(options);
+        // The report would replace the target or the store: said before the run, not after.
+        if (options.output)
+            OutputFile::RefuseInput(*options.output, kReportWhat, kReportSource);
     } catch (const VtrError& error) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
@@ -225,16 +239,39 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.targetFile = options.targetFile;
     record.cancelled = observer.Cancelled() || LibVerify::IsCancelled();
     record.checksPerformed = LibVerify::ChecksPerformedCount();
-    record.errors = LibVerify::ErrorCount();
-    record.warnings = LibVerify::WarningCount();
     record.results = observer.TakeResults();
+    if (baseline)
+        baseline->Mark(record);
 
-    int status = ExitStatusOf(record);
+    Presentation presentation;
+    presentation.minimumSeverity = options.minimumSeverity;
+    presentation.groupBy = options.groupBy;
+    presentation.statistics = options.statistics;
+    presentation.failOn = options.failOn;
+    presentation.color = UseColor(options.color, console.outIsColorTerminal);
+    presentation.baselineFile = options.baseline;
+
+    // A cancelled run found less than there is: whatever it found, it is not a result.
+    int status = record.cancelled ? ExitStatus::Cancelled : ExitStatusOf(record, options.failOn);
     if (options.output) {
+        // Never over a file the run read or checked (the report writer refuses it), and
+        // whole or not at all.
         try {
-            ResultsReport::SaveResultsReport(*options.output);
+            SaveReport(*options.output, record, presentation);
         } catch (const VtrError& error) {
-            Fail(console.err, "Error Saving Verifier Messages: " + error.Description());
+            Fail(console.err, error.Description());
+            status = ExitStatus::CannotSetUp;
+        }
+    }
+    if (options.writeBaseline && record.cancelled) {
+        Fail(console.err, "the baseline " + *options.writeBaseline +
+                              " was not written: the verification was cancelled");
+    } else if (options.writeBaseline) {
+        try {
+            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), "baseline",
+                              kReportSource);
+        } catch (const VtrError& error) {
+            Fail(console.err, error.Description());
             status = ExitStatus::CannotSetUp;
         }
     }
@@ -242,9 +279,9 @@ int RunVerify(const Options& givenOptions, Console& console) {
     interrupts.reset();
 
     if (options.format == OutputFormat::Json)
-        WriteJson(console.out, record);
+        WriteJson(console.out, record, presentation);
     else
-        WriteText(console.out, record);
+        WriteText(console.out, record, presentation);
     console.out.flush();
     return status;
 }

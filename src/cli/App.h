@@ -14,7 +14,8 @@ struct Console {
     std::ostream& err;  // usage errors, failures, the --log lines, the progress display
     bool errIsTerminal = false;
     int errColumns = 80;
-    ProgressLine::Clock clock = {};  // the progress display's clock; the steady clock when empty
+    ProgressLine::Clock clock = {};   // the progress display's clock; the steady clock when empty
+    bool outIsColorTerminal = false;  // out is a terminal that shows colour escapes
 };
 
 // Parses the command line, selects the settings store and runs the command. Returns the

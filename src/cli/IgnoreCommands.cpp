@@ -6,6 +6,7 @@
 #include <ostream>
 #include <string_view>
 
+#include "engine/IgnoreKeyText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryStore.h"
@@ -29,6 +30,11 @@ std::string StoreName() {
 
 std::string Quoted(const std::string& text) {
     return "\"" + text + "\"";
+}
+
+// A key as the user sees it: in double quotes, in the text form that "ignore --key" takes.
+std::string QuotedKey(const std::string& key) {
+    return Quoted(IgnoreKeyText::Encode(key));
 }
 
 }  // namespace
@@ -58,11 +64,24 @@ std::optional<Result> ResultFromIgnoreKey(const std::string& key) {
     return result;
 }
 
+std::optional<std::string> KeyFromArgument(const std::string& argument) {
+    std::optional<std::string> key = IgnoreKeyText::Decode(argument);
+    if (!key)
+        return std::nullopt;
+    // "23-a / b" and "23-a / b /" are "23-a / b / "; "23-" (no details) stays as it is.
+    const std::size_t dash = key->find('-', key->starts_with("-") ? 1 : 0);
+    const bool hasDetails = dash != std::string::npos && dash + 1 < key->size();
+    if (hasDetails && !key->ends_with(kDetailEnd))
+        *key += key->ends_with(kDetailEnd.substr(0, 2)) ? " " : std::string(kDetailEnd);
+    return key;
+}
+
 int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& err) {
     const bool ignore = options.command == Command::Ignore;
     ReloadIgnoreLists();
 
     std::string what;
+    std::string key;  // the result's key, for --key
     bool listed = false;
     if (options.messageNumber) {
         const std::string text = std::to_string(*options.messageNumber);
@@ -73,16 +92,24 @@ int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& er
         else
             IgnoreLists::UnignoreMessageNumber(*options.messageNumber);
     } else {
-        const std::string key = options.ignoreKey.value_or("");
+        const std::string given = options.ignoreKey.value_or("");
+        const std::optional<std::string> decoded = KeyFromArgument(given);
+        if (!decoded) {
+            err << "vantori-verify: " << Quoted(given)
+                << " is not a result's key: after \"escaped:\", a backslash begins \"\\\\\" "
+                   "(one backslash) or \"\\x\" and two hexadecimal digits (one byte)\n";
+            return ExitStatus::Usage;
+        }
+        key = *decoded;
         const std::optional<Result> result = ResultFromIgnoreKey(key);
         if (!result) {
-            err << "vantori-verify: " << Quoted(key)
+            err << "vantori-verify: " << Quoted(given)
                 << " is not a result's key: a key is the message number, \"-\", then each "
                    "detail followed by \" / \" (as \"vantori-verify ignored\" and --format "
                    "json show it)\n";
             return ExitStatus::Usage;
         }
-        what = "The result " + Quoted(key);
+        what = "The result " + QuotedKey(key);
         listed = IgnoreLists::IsIgnoreKeyIgnored(key);
         if (ignore)
             IgnoreLists::IgnoreResult(*result);
@@ -96,7 +123,7 @@ int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& er
         const bool nowListed =
             options.messageNumber
                 ? IgnoreLists::IsMessageNumberIgnored(std::to_string(*options.messageNumber))
-                : IgnoreLists::IsIgnoreKeyIgnored(*options.ignoreKey);
+                : IgnoreLists::IsIgnoreKeyIgnored(key);
         if (nowListed != ignore) {
             err << "vantori-verify: the ignore list could not be saved in " << StoreName() << "\n";
             return ExitStatus::CannotSetUp;
@@ -126,7 +153,10 @@ int RunListIgnored(const Options& options, std::ostream& out) {
     if (options.format == OutputFormat::Json) {
         nlohmann::ordered_json document;
         document["messageNumbers"] = numbers;
-        document["results"] = keys;
+        nlohmann::ordered_json texts = nlohmann::ordered_json::array();
+        for (const std::string& key : keys)
+            texts.push_back(IgnoreKeyText::Encode(key));
+        document["results"] = std::move(texts);
         out << document.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace)
             << "\n";
         return ExitStatus::Clean;
@@ -141,7 +171,7 @@ int RunListIgnored(const Options& options, std::ostream& out) {
     if (keys.empty())
         out << "    (none)\n";
     for (const std::string& key : keys)
-        out << "    " << Quoted(key) << "\n";
+        out << "    " << QuotedKey(key) << "\n";
     return ExitStatus::Clean;
 }
 

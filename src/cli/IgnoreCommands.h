@@ -24,4 +24,9 @@ int RunListIgnored(const Options& options, std::ostream& out);
 // A key is a message number in decimal, "-", then each detail followed by " / ".
 std::optional<Result> ResultFromIgnoreKey(const std::string& key);
 
+// The key that a key given on the command line stands for: its text decoded (a text that
+// begins "escaped:", see IgnoreKeyText) and the " / " after the last detail added when it was
+// left out. Nothing for an escaped text that cannot be decoded.
+std::optional<std::string> KeyFromArgument(const std::string& argument);
+
 }  // namespace vtr::cli

@@ -2,9 +2,23 @@
 
 namespace vtr::cli {
 
-// Ctrl-C (SIGINT) and SIGTERM during a run: while an InterruptGuard lives, the signals only
-// raise a flag, which the event pump turns into a clean cancellation between two steps of
-// the run. The handlers that were in place come back when the guard ends.
+// What asked a run to stop.
+enum class Interruption { None, CtrlC, Terminate, HangUp, OutputClosed };
+
+// Signals during a run. While an InterruptGuard lives, Ctrl-C (SIGINT), SIGTERM, a hang-up
+// (SIGHUP) and output that can no longer be written (SIGPIPE) only note what happened; the
+// event pump turns that into a clean cancellation: the check that is running finishes, the
+// temporary files are removed as at any other end, the program exits 130.
+//
+// Asked again (a second Ctrl-C, SIGTERM or hang-up), the program ends at once: the handler
+// itself removes the registered temporary files (LibFile) and lets the signal end the
+// process as usual. SIGPIPE counts once; after it, writes fail quietly instead, and stay so
+// when the guard ends, since the output is gone.
+//
+// On Windows the console's control handler does the same for Ctrl-C and Ctrl-Break; the
+// console closing, a log-off or a shutdown removes the temporary files and ends at once.
+//
+// The handlers that were in place come back when the guard ends.
 class InterruptGuard {
   public:
     InterruptGuard();
@@ -12,13 +26,12 @@ class InterruptGuard {
     InterruptGuard(const InterruptGuard&) = delete;
     InterruptGuard& operator=(const InterruptGuard&) = delete;
 
-    // True once a signal arrived since the guard was made.
-    static bool Requested();
-
-  private:
-    using Handler = void (*)(int);
-    Handler previousInterrupt_;
-    Handler previousTerminate_;
+    // The first request since the guard was made; None when there was none.
+    static Interruption Requested();
 };
+
+// What the program says when it starts cancelling for that reason, e.g. "Ctrl-C: cancelling
+// ...".
+const char* CancellingNotice(Interruption interruption);
 
 }  // namespace vtr::cli

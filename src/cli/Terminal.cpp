@@ -52,4 +52,33 @@ int TerminalColumns(std::FILE* stream) {
     return ColumnsFromEnvironment();
 }
 
+bool EnableColorEscapes(std::FILE* stream) {
+#ifdef _WIN32
+    const HANDLE handle = GetStdHandle(stream == stdout ? STD_OUTPUT_HANDLE : STD_ERROR_HANDLE);
+    DWORD mode = 0;
+    if (!GetConsoleMode(handle, &mode))
+        return false;
+    return (mode & ENABLE_VIRTUAL_TERMINAL_PROCESSING) != 0 ||
+           SetConsoleMode(handle, mode | ENABLE_VIRTUAL_TERMINAL_PROCESSING) != 0;
+#else
+    (void)stream;
+    return true;
+#endif
+}
+
+bool UseColor(ColorChoice choice, bool colorTerminal) {
+    switch (choice) {
+        case ColorChoice::Always:
+            return true;
+        case ColorChoice::Never:
+            return false;
+        case ColorChoice::Auto:
+            break;
+    }
+    const char* noColor = std::getenv("NO_COLOR");
+    const char* term = std::getenv("TERM");
+    return colorTerminal && (noColor == nullptr || *noColor == '\0') &&
+           (term == nullptr || std::string(term) != "dumb");
+}
+
 }  // namespace vtr::cli

@@ -7,5 +7,7 @@
 int main(int argc, char** argv) {
     vtr::cli::Console console{std::cout, std::cerr, vtr::cli::IsTerminal(stderr),
                               vtr::cli::TerminalColumns(stderr)};
+    console.outIsColorTerminal =
+        vtr::cli::IsTerminal(stdout) && vtr::cli::EnableColorEscapes(stdout);
     return vtr::cli::Main(argc, argv, console);
 }

@@ -1,7 +1,6 @@
 #include "engine/LibVerify.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <deque>
 #include <exception>
 #include <memory>
@@ -14,6 +13,7 @@
 #include "checks/CheckWMP.h"
 #include "engine/IgnoreLists.h"
 #include "engine/VtrError.h"
+#include "environment/FilesRead.h"
 #include "environment/LibFile.h"
 #include "environment/NetworkPreferences.h"
 #include "environment/SequenceLoader.h"
@@ -115,8 +115,18 @@ struct VerificationState {
     ~VerificationState() {
         for (const std::string* name : {&tempShowFile, &tempWeeklyFile, &tempYearlyFile}) {
             if (!name->empty())
-                std::remove(name->c_str());
+                LibFile::DeleteTempFile(*name);
         }
+    }
+
+    bool IsTempFile(const std::string& name) const {
+        return !name.empty() &&
+               (name == tempShowFile || name == tempWeeklyFile || name == tempYearlyFile);
+    }
+    // Remembers a file the run read (FilesRead), unless it is one of the run's own.
+    void RecordRead(const std::string& name) const {
+        if (!IsTempFile(name))
+            FilesRead::Record(name, FilesRead::Use::Read);
     }
 };
 
@@ -165,15 +175,26 @@ constexpr int32_t kTargetSecond = 37;
     Raise(ErrorNumbers::UserMessage, source, description);
 }
 
-// Makes a temporary file, remembered in `slot` so that DeleteTempFiles finds it; a failure
-// deletes the temporary files made so far and raises error 37 with the text of the failure.
+// Makes a temporary file, remembered in `slot` so that DeleteTempFiles finds it and
+// registered so that the program removes it however it ends (LibFile); a failure deletes the
+// temporary files made so far and raises error 37 with the text of the failure.
 const std::string& MakeTempFile(std::string& slot, const char* prefix, const char* source) {
     try {
         slot = LibFile::MakeTempFileName(prefix);
     } catch (...) {
         RaiseTargetError(source, DescribeFailure(std::current_exception()));
     }
+    LibFile::RegisterTempFile(slot);
     return slot;
+}
+
+// Stores the names of the schedule files to verify and drops any loaded schedules.
+void SelectScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile) {
+    VerificationState& state = State();
+    state.weeklyScheduleFile = weeklyFile;
+    state.yearlyScheduleFile = yearlyFile;
+    state.weeklySchedule = nullptr;
+    state.yearlySchedule = nullptr;
 }
 
 // Builds the temporary schedule pair for one show and selects it.
@@ -200,7 +221,7 @@ void BuildShowTarget(const std::string& showFile) {
     if (!ResumeStep([&] { yearSchedule.Save(yearlyFile); }))
         RaiseTargetError(kSource, "Cannot save temporary yearly file " + yearlyFile);
 
-    SetScheduleFiles(weeklyFile, yearlyFile);
+    SelectScheduleFiles(weeklyFile, yearlyFile);
 }
 
 }  // namespace
@@ -305,21 +326,20 @@ OrderedStringSet& IgnoredResultKeys() {
 // --- Target selection -----------------------------------------------------------------------
 
 void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile) {
-    VerificationState& state = State();
-    state.weeklyScheduleFile = weeklyFile;
-    state.yearlyScheduleFile = yearlyFile;
-    state.weeklySchedule = nullptr;
-    state.yearlySchedule = nullptr;
+    FilesRead::SetTargetFiles({weeklyFile, yearlyFile});
+    SelectScheduleFiles(weeklyFile, yearlyFile);
 }
 
 void VerifyShowFile(const std::string& showFile) {
     DeleteTempFiles();
+    FilesRead::SetTargetFiles({showFile});
     BuildShowTarget(showFile);
 }
 
 void VerifySequenceFile(const std::string& sequenceFile) {
     constexpr const char* kSource = "LibVerify.VerifySequenceFile";
     DeleteTempFiles();
+    FilesRead::SetTargetFiles({sequenceFile});
     VerificationState& state = State();
 
     Show show;
@@ -349,7 +369,7 @@ void DeleteTempFiles() {
     VerificationState& state = State();
     for (std::string* name : {&state.tempShowFile, &state.tempWeeklyFile, &state.tempYearlyFile}) {
         if (!name->empty()) {
-            std::remove(name->c_str());  // a file that cannot be deleted is left to the system
+            LibFile::DeleteTempFile(*name);  // a file that cannot be deleted is left to the system
             name->clear();
         }
     }
@@ -375,6 +395,7 @@ void BeginVerification() {
     state.weeklySchedule = nullptr;
     state.yearlySchedule = nullptr;
     state.loadCounts = {};
+    FilesRead::BeginRun();
 
     state.cancelled = false;
 
@@ -467,6 +488,7 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
         return nullptr;  // a cancelled run loads nothing more
 
     ++state.loadCounts.sequenceLoads;
+    state.RecordRead(fileName);
     std::shared_ptr<seqlib::Sequence> sequence;
     std::string failure;
     bool failed = false;
@@ -494,6 +516,7 @@ std::shared_ptr<Show> LoadShow(const std::string& fileName) {
         return cached->second;
 
     ++state.loadCounts.showReads;
+    state.RecordRead(fileName);
     ShowPtr show = ResumeOr(ShowPtr{}, [&] { return ShowFunctions::LoadShowFile(fileName); });
     // A show that cannot be read is not kept, so a later request tries again.
     if (show)
@@ -511,6 +534,7 @@ NetworkPreferences& GetNetworkPreferences() {
 std::shared_ptr<Schedule> GetSchedule() {
     VerificationState& state = State();
     if (!state.weeklySchedule) {
+        state.RecordRead(state.weeklyScheduleFile);
         state.weeklySchedule = ResumeOr(SchedulePtr{}, [&] {
             return ScheduleFunctions::LoadSchedule(state.weeklyScheduleFile);
         });
@@ -521,6 +545,7 @@ std::shared_ptr<Schedule> GetSchedule() {
 std::shared_ptr<YearSchedule> GetYearSchedule() {
     VerificationState& state = State();
     if (!state.yearlySchedule) {
+        state.RecordRead(state.yearlyScheduleFile);
         state.yearlySchedule = ResumeOr(YearSchedulePtr{}, [&] {
             return YearScheduleFunctions::LoadYearSchedule(state.yearlyScheduleFile);
         });

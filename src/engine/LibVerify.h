@@ -71,6 +71,9 @@ OrderedStringSet& IgnoredResultKeys();
 
 // --- Target selection (before each run) ---------------------------------------------------
 
+// Target selection also tells FilesRead which files the target names; a run records there
+// every file it reads, so that no report replaces one of them.
+//
 // Stores both names and drops any loaded schedules.
 void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile);
 // Wraps one show in a temporary weekly schedule ("VTRVer-WS-": one show event from day 1,

@@ -1,13 +1,9 @@
 #include "engine/ResultsReport.h"
 
-#include <cerrno>
-#include <cstdio>
-#include <system_error>
-
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
+#include "environment/OutputFile.h"
 #include "environment/VTRCommon.h"
-#include "show/WholeFile.h"
 
 namespace vtr::ResultsReport {
 
@@ -24,53 +20,31 @@ std::string ReportText() {
         if (!first)
             text += std::string(79, '=') + "\r\n";
         first = false;
-        text += "Message Number: " + std::to_string(result->MessageNumber()) + "\r\n";
-        text += "Severity: " + result->SeverityText() + "\r\n";
-        text += "Description: " + result->Summary() + "\r\n";
-        const auto& details = result->Details();
-        for (std::size_t i = 0; i < details.size(); ++i) {
-            const std::string label =
-                details.size() == 1 ? "Detail" : "Detail #" + std::to_string(i + 1);
-            text += label + ": " + details[i] + "\r\n";
-        }
+        text += ResultText(*result);
     }
     return text;
 }
 
-std::string SystemText(int error) {
-    return std::generic_category().message(error);
-}
-
 }  // namespace
 
-void SaveResultsReport(const std::string& fileName) {
-    std::FILE* file = nullptr;
-    try {
-        const std::string text = ReportText();
-        file = std::fopen(fileName.c_str(), "wb");
-        if (file == nullptr) {
-            Raise(FileErrors::PathFileAccessError, kSource,
-                  "Cannot create the results file " + fileName + ": " + SystemText(errno));
-        }
-        errno = 0;
-        if (std::fwrite(text.data(), 1, text.size(), file) != text.size() ||
-            std::fflush(file) != 0) {
-            Raise(FileErrors::DeviceIoError, kSource,
-                  "Cannot write the results file " + fileName + ": " +
-                      SystemText(errno != 0 ? errno : EIO));
-        }
-        std::FILE* closing = file;
-        file = nullptr;
-        if (std::fclose(closing) != 0) {
-            Raise(FileErrors::DeviceIoError, kSource,
-                  "Cannot write the results file " + fileName + ": " +
-                      SystemText(errno != 0 ? errno : EIO));
-        }
-    } catch (...) {
-        if (file != nullptr)
-            std::fclose(file);
-        throw;
+std::string ResultText(const Result& result, std::string_view lineEnd) {
+    std::string text = "Message Number: " + std::to_string(result.MessageNumber());
+    text += lineEnd;
+    text += "Severity: " + result.SeverityText();
+    text += lineEnd;
+    text += "Description: " + result.Summary();
+    text += lineEnd;
+    const auto& details = result.Details();
+    for (std::size_t i = 0; i < details.size(); ++i) {
+        text += details.size() == 1 ? std::string("Detail") : "Detail #" + std::to_string(i + 1);
+        text += ": " + details[i];
+        text += lineEnd;
     }
+    return text;
+}
+
+void SaveResultsReport(const std::string& fileName) {
+    OutputFile::Write(fileName, ReportText(), "results file", kSource);
 }
 
 DialogSettings ChooseResultsReportFileSettings() {

@@ -1,8 +1,12 @@
 #include "environment/LibFile.h"
 
+#include <atomic>
+#include <cstdio>
 #include <cstdlib>
+#include <cstring>
 
 #include "engine/VtrError.h"
+#include "environment/FilesRead.h"
 
 #ifdef _WIN32
 #include <windows.h>
@@ -25,7 +29,68 @@ constexpr char kSeparator = '/';
 
 constexpr const char* kTempSource = "LibFile.MakeTempFileName";
 
+// The registered temporary files. A slot is free, being filled or emptied by the program, or
+// ready; a signal handler only ever takes ready slots, so it never reads a half-written name.
+enum SlotState : int { kFree = 0, kBusy = 1, kReady = 2 };
+constexpr std::size_t kTempSlots = 16;
+constexpr std::size_t kTempPathBytes = 4096;
+static_assert(std::atomic<int>::is_always_lock_free, "slots must be usable in a signal handler");
+
+struct TempSlot {
+    std::atomic<int> state{kFree};
+    char path[kTempPathBytes];
+};
+TempSlot tempSlots[kTempSlots];
+
+void RemoveFile(const char* path) noexcept {
+#ifdef _WIN32
+    DeleteFileA(path);
+#else
+    ::unlink(path);
+#endif
+}
+
 }  // namespace
+
+void RegisterTempFile(const std::string& path) {
+    if (path.empty() || path.size() >= kTempPathBytes)
+        return;
+    for (TempSlot& slot : tempSlots) {
+        int expected = kFree;
+        if (slot.state.compare_exchange_strong(expected, kBusy)) {
+            std::memcpy(slot.path, path.c_str(), path.size() + 1);
+            slot.state.store(kReady);
+            return;
+        }
+    }
+}
+
+void UnregisterTempFile(const std::string& path) {
+    for (TempSlot& slot : tempSlots) {
+        int expected = kReady;
+        if (slot.state.load() == kReady && std::strcmp(slot.path, path.c_str()) == 0 &&
+            slot.state.compare_exchange_strong(expected, kBusy)) {
+            slot.state.store(kFree);
+            return;
+        }
+    }
+}
+
+void DeleteTempFile(const std::string& path) {
+    // Deleted before it is forgotten: a signal in between finds the name still registered.
+    RemoveFile(path.c_str());
+    UnregisterTempFile(path);
+}
+
+void RemoveRegisteredTempFiles() noexcept {
+    for (TempSlot& slot : tempSlots) {
+        int expected = kReady;
+        if (slot.state.compare_exchange_strong(expected, kBusy)) {
+            RemoveFile(slot.path);
+            slot.state.store(kFree);
+        }
+    }
+}
 
 std::string AddTrailingBackslash(const std::string& path) {
     if (path.empty() || path.back() == '\\' || path.back() == '/')
@@ -36,11 +101,13 @@ std::string AddTrailingBackslash(const std::string& path) {
 #ifdef _WIN32
 
 bool DirectoryExists(const std::string& path) {
+    FilesRead::Record(path, FilesRead::Use::Checked);
     const DWORD attributes = GetFileAttributesA(path.c_str());
     return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY) != 0;
 }
 
 bool FileExists(const std::string& path) {
+    FilesRead::Record(path, FilesRead::Use::Checked);
     const DWORD attributes = GetFileAttributesA(path.c_str());
     return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY) == 0;
 }
@@ -87,11 +154,13 @@ std::string MakeTempFileName(const std::string& prefix) {
 #else
 
 bool DirectoryExists(const std::string& path) {
+    FilesRead::Record(path, FilesRead::Use::Checked);
     struct stat status;
     return ::stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode);
 }
 
 bool FileExists(const std::string& path) {
+    FilesRead::Record(path, FilesRead::Use::Checked);
     struct stat status;
     return ::stat(path.c_str(), &status) == 0 && !S_ISDIR(status.st_mode);
 }

@@ -1,9 +1,11 @@
 #include "DialogPresenter.h"
 
+#include <QDesktopServices>
 #include <QDir>
 #include <QFileDialog>
 #include <QFileInfo>
 #include <QMessageBox>
+#include <QUrl>
 
 namespace vtr {
 
@@ -30,6 +32,10 @@ QList<FileFilter> ParseFilterList(const QString& notation) {
 
 void QtDialogPresenter::ShowError(QWidget* parent, const QString& title, const QString& text) {
     QMessageBox::critical(parent, title, text);
+}
+
+bool QtDialogPresenter::OpenFolder(QWidget*, const QString& folder) {
+    return QDesktopServices::openUrl(QUrl::fromLocalFile(folder));
 }
 
 namespace {

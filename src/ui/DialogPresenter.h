@@ -41,8 +41,9 @@ QString FilterText(const FileFilter& filter);
 // ";"), as the report dialog's settings carry it.
 QList<FileFilter> ParseFilterList(const QString& notation);
 
-// What the window asks of the user outside its own controls: message boxes and file
-// dialogs. The window is given one; the program uses the Qt dialogs, tests a recording one.
+// What the window asks of the user outside its own controls: message boxes, file dialogs
+// and the desktop's file manager. The window is given one; the program uses the Qt dialogs
+// and the desktop's services, tests a recording one.
 class DialogPresenter {
   public:
     virtual ~DialogPresenter() = default;
@@ -51,6 +52,8 @@ class DialogPresenter {
     // A file dialog; the chosen path, or nothing when the user cancelled.
     virtual std::optional<QString> ChooseFile(QWidget* parent,
                                               const FileDialogRequest& request) = 0;
+    // Shows a folder in the desktop's file manager; false when that cannot be done.
+    virtual bool OpenFolder(QWidget* parent, const QString& folder) = 0;
 };
 
 // The real dialogs: QMessageBox and QFileDialog.
@@ -58,6 +61,7 @@ class QtDialogPresenter : public DialogPresenter {
   public:
     void ShowError(QWidget* parent, const QString& title, const QString& text) override;
     std::optional<QString> ChooseFile(QWidget* parent, const FileDialogRequest& request) override;
+    bool OpenFolder(QWidget* parent, const QString& folder) override;
 };
 
 }  // namespace vtr

@@ -2,7 +2,9 @@
 
 #include <QAction>
 #include <QApplication>
+#include <QClipboard>
 #include <QCloseEvent>
+#include <QComboBox>
 #include <QCursor>
 #include <QDir>
 #include <QDragEnterEvent>
@@ -23,15 +25,19 @@
 #include <QScrollBar>
 #include <QSettings>
 #include <QShortcut>
+#include <QSplitter>
 #include <QStyle>
 #include <QTabWidget>
 #include <QTextBlock>
 #include <QTimer>
-#include <QTreeWidget>
+#include <QToolButton>
 #include <QVBoxLayout>
 #include <algorithm>
 #include <exception>
 
+#include "ResultDetailsPane.h"
+#include "ResultsModel.h"
+#include "ResultsView.h"
 #include "UiText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
@@ -56,6 +62,8 @@ const QString kErrorSavingMessages = QStringLiteral("Error Saving Verifier Messa
 const QString kHelpContextError = QStringLiteral("Help Context Error");
 const QString kHelpFileError = QStringLiteral("Help File Error");
 const QString kDoubleClickError = QStringLiteral("Details List Double Click Error");
+const QString kIgnoreListError = QStringLiteral("Ignore List Error");
+const QString kOpenFolderError = QStringLiteral("Error Opening Folder");
 
 // Settings of the window's own file.
 const QString kGeometryKey = QStringLiteral("window/geometry");
@@ -63,42 +71,8 @@ const QString kTargetKindKey = QStringLiteral("target/kind");
 const QString kTargetSequenceKey = QStringLiteral("target/sequence");
 const QString kTargetShowKey = QStringLiteral("target/show");
 
-constexpr int kDetailColumns = 9;
-
-// A list item: the result it shows (its tag) and the order in which results were listed,
-// so that a result moved between the lists lands where it was produced.
-class ResultItem : public QTreeWidgetItem {
-  public:
-    ResultItem(ResultPtr result, qint64 order)
-        : QTreeWidgetItem(UserType), result_(std::move(result)), order_(order) {}
-
-    const ResultPtr& Result() const { return result_; }
-    qint64 Order() const { return order_; }
-
-    // Sorting by a column: severity and message number by value, the texts as the user's
-    // language orders them; equal values keep the order in which they were produced.
-    bool operator<(const QTreeWidgetItem& other) const override {
-        const auto* that = dynamic_cast<const ResultItem*>(&other);
-        if (that == nullptr)
-            return QTreeWidgetItem::operator<(other);
-        const int column = treeWidget() != nullptr ? treeWidget()->sortColumn() : -1;
-        int compared = 0;
-        if (column == frmVerifier::SeverityColumn) {
-            compared =
-                static_cast<int>(result_->Severity()) - static_cast<int>(that->result_->Severity());
-        } else if (column == frmVerifier::MsgNumColumn) {
-            compared = (result_->MessageNumber() > that->result_->MessageNumber()) -
-                       (result_->MessageNumber() < that->result_->MessageNumber());
-        } else if (column >= 0) {
-            compared = QString::localeAwareCompare(text(column), other.text(column));
-        }
-        return compared != 0 ? compared < 0 : order_ < that->order_;
-    }
-
-  private:
-    ResultPtr result_;
-    qint64 order_;
-};
+// The progress bar's text while a run goes and after it completed.
+const QString kProgressFormat = QStringLiteral("%v of %m checks");
 
 // What a file is as a target, by its extension.
 enum class TargetKind { None, Sequence, Show };
@@ -110,6 +84,18 @@ TargetKind KindOfFile(const QString& path) {
     if (suffix == QLatin1String("las") || suffix == QLatin1String("lms"))
         return TargetKind::Sequence;
     return TargetKind::None;
+}
+
+// A target file as the window verifies and remembers it: absolute, relative names taken from
+// the working folder, "." and ".." resolved, in the system's own notation. The results name
+// the file this way, and so does the key that ignores one of them, wherever the window is
+// opened next. Empty stays empty.
+QString AbsoluteTarget(const QString& path) {
+    const QString trimmed = path.trimmed();
+    if (trimmed.isEmpty())
+        return trimmed;
+    return QDir::toNativeSeparators(
+        QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
 }
 
 QString ErrorText(const std::exception& error) {
@@ -221,20 +207,18 @@ void frmVerifier::PumpEvents() {
     }
     // During a run the core calls this after every check and result, thousands of times
     // on a large schedule. Input is handled every time, so a click on Cancel is seen at
-    // once; the summary is brought up to date and the window drawn at most every
-    // kRepaintIntervalMs, since laying out and drawing the window costs far more than a
-    // check.
+    // once; what the run changes on screen (the log, the lists, the summary) changes at
+    // most every kRepaintIntervalMs, since laying out and drawing costs far more than a
+    // check: in between, handling events finds nothing to draw.
     if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
         repaintClock_.restart();
         FlushLog();
+        TakeNewResults(false);
         if (summaryPending_)
             RefreshSummary();
         lblStatus_->setText(statusText_);
-        setUpdatesEnabled(true);
     }
     QCoreApplication::processEvents();
-    if (running_)
-        setUpdatesEnabled(false);
 }
 
 void frmVerifier::BuildControls() {
@@ -298,14 +282,11 @@ void frmVerifier::BuildControls() {
     rtxOutputLog_->setUndoRedoEnabled(false);
     rtxOutputLog_->setTextInteractionFlags(Qt::TextSelectableByMouse |
                                            Qt::TextSelectableByKeyboard);
-    // The severity colours are chosen for a light page, whatever the desktop's theme.
-    QPalette logPalette = rtxOutputLog_->palette();
-    logPalette.setColor(QPalette::Base, Qt::white);
-    logPalette.setColor(QPalette::Text, Qt::black);
-    rtxOutputLog_->setPalette(logPalette);
+    // The lines' colours follow the palette: chosen again whenever it changes.
+    rtxOutputLog_->installEventFilter(this);
     imlSeverity_ = new SeverityImageList(this);
-    lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"));
-    lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"));
+    lvResults_[0] = BuildResultList(QStringLiteral("lvResults1"), Listing::NotIgnored);
+    lvResults_[1] = BuildResultList(QStringLiteral("lvResults2"), Listing::Ignored);
     sstDetails_->addTab(rtxOutputLog_, QStringLiteral("Output Log"));
     sstDetails_->addTab(lvResults_[0], QStringLiteral("Results"));
     sstDetails_->addTab(lvResults_[1], QStringLiteral("Ignored Results"));
@@ -360,9 +341,33 @@ void frmVerifier::BuildControls() {
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(frameSummary_, 1);
     bottom->addLayout(buttons);
+    // The selected result whole, under the lists; the user sets the share of each.
+    fraResultDetails_ = new ResultDetailsPane(central);
+    auto* splitter = new QSplitter(Qt::Vertical, central);
+    splitter->setObjectName(QStringLiteral("splDetails"));
+    auto* lists = new QWidget(splitter);
+    auto* listsLayout = new QVBoxLayout(lists);
+    listsLayout->setContentsMargins(0, 0, 0, 0);
+    listsLayout->setSpacing(4);
+    listsLayout->addWidget(BuildFindBar(lists));
+    listsLayout->addWidget(sstDetails_, 1);
+    splitter->addWidget(lists);
+    splitter->addWidget(fraResultDetails_);
+    splitter->setStretchFactor(0, 3);
+    splitter->setStretchFactor(1, 1);
+    splitter->setSizes({400, fontMetrics().height() * 12});
+    splitter->setChildrenCollapsible(false);
+    connect(sstDetails_, &QTabWidget::currentChanged, this, [this] {
+        ShowSelectedResult();
+        ShowCounts();
+    });
+    connect(fraResultDetails_, &ResultDetailsPane::HelpRequested, this, &frmVerifier::HelpOnResult);
+    connect(fraResultDetails_, &ResultDetailsPane::OpenFolderRequested, this,
+            &frmVerifier::OpenFolder);
+
     auto* layout = new QVBoxLayout(central);
     layout->addWidget(frameTarget_);
-    layout->addWidget(sstDetails_, 1);
+    layout->addWidget(splitter, 1);
     layout->addLayout(bottom);
 
     // Progress of a run and the passing status text, beside the counts.
@@ -370,7 +375,7 @@ void frmVerifier::BuildControls() {
     prgVerification_->setObjectName(QStringLiteral("prgVerification"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
-    prgVerification_->setFormat(QStringLiteral("%v of %m checks"));
+    prgVerification_->setFormat(kProgressFormat);
     prgVerification_->setAccessibleName(QStringLiteral("Verification progress"));
     lblStatus_ = new QLabel(frameSummary_);
     lblStatus_->setObjectName(QStringLiteral("lblStatus"));
@@ -380,57 +385,212 @@ void frmVerifier::BuildControls() {
     summaryLayout->addWidget(lblStatus_, 1, 4);
 
     setAcceptDrops(true);
-    resize(900, 640);
+    resize(1040, 740);
+    ShowSelectedResult();
 }
 
-QTreeWidget* frmVerifier::BuildResultList(const QString& name) {
-    auto* list = new QTreeWidget(sstDetails_);
+ResultsView* frmVerifier::BuildResultList(const QString& name, Listing listing) {
+    auto* model = new ResultsModel(
+        grouping_, listing,
+        [this](Severity severity) {
+            return imlSeverity_->Image(FromSuiteText(SeverityText(severity)));
+        },
+        this);
+    auto* list = new ResultsView(model, sstDetails_);
     list->setObjectName(name);
-    QStringList headers{QStringLiteral("Description"), QStringLiteral("Severity"),
-                        QStringLiteral("Msg Num")};
-    for (int i = 1; i <= kDetailColumns; ++i)
-        headers.append(QStringLiteral("Details%1").arg(i));
-    list->setColumnCount(static_cast<int>(headers.size()));
-    list->setHeaderLabels(headers);
-    list->setRootIsDecorated(false);
-    list->setUniformRowHeights(true);
-    list->setAlternatingRowColors(true);
-    list->setAllColumnsShowFocus(true);
-    list->setSelectionMode(QAbstractItemView::SingleSelection);
-    list->setSelectionBehavior(QAbstractItemView::SelectRows);
-    list->setContextMenuPolicy(Qt::CustomContextMenu);
-    list->header()->setStretchLastSection(false);
-    list->setColumnWidth(DescriptionColumn, 330);
-    list->setColumnWidth(SeverityColumn, 90);
-    list->setColumnWidth(MsgNumColumn, 70);
-    for (int i = 0; i < kDetailColumns; ++i)
-        list->setColumnWidth(Details1Column + i, 240);
-    // The results stay in the order produced until a column header is clicked.
-    list->header()->setSortIndicator(-1, Qt::AscendingOrder);
-    list->setSortingEnabled(true);
-
-    connect(list, &QTreeWidget::customContextMenuRequested, this,
-            [this, list](const QPoint& position) { ShowResultPopup(list, position); });
-    connect(list, &QTreeWidget::itemDoubleClicked, this,
-            [this](QTreeWidgetItem* item) { OpenResult(ResultOf(item)); });
+    connect(list, &ResultsView::PopupRequested, this,
+            [this, list](const QModelIndex& index, const QPoint& at) {
+                ShowResultPopup(list, index, at);
+            });
+    connect(list, &QTreeView::doubleClicked, this, [this](const QModelIndex& index) {
+        // A group's row opens and closes; a result's opens its help.
+        if (const ResultPtr result = ResultOf(index))
+            OpenResult(result);
+    });
+    connect(list->selectionModel(), &QItemSelectionModel::currentChanged, this,
+            [this] { ShowSelectedResult(); });
+    connect(list->selectionModel(), &QItemSelectionModel::selectionChanged, this,
+            [this] { ShowSelectedResult(); });
+    // Clicking a column's header sorts by it, in place of errors first.
+    connect(list->header(), &QHeaderView::sortIndicatorChanged, this, [this](int column) {
+        if (column >= 0 && chkErrorsFirst_->isChecked())
+            chkErrorsFirst_->setChecked(false);
+    });
+    auto* copy = new QShortcut(QKeySequence::Copy, list, nullptr, nullptr, Qt::WidgetShortcut);
+    connect(copy, &QShortcut::activated, this, [this, list] { CopyResult(SelectedResult(list)); });
     auto* open =
         new QShortcut(QKeySequence(Qt::Key_Return), list, nullptr, nullptr, Qt::WidgetShortcut);
     auto* openEnter =
         new QShortcut(QKeySequence(Qt::Key_Enter), list, nullptr, nullptr, Qt::WidgetShortcut);
-    for (QShortcut* shortcut : {open, openEnter})
-        connect(shortcut, &QShortcut::activated, this,
-                [this, list] { OpenResult(SelectedResult(list)); });
+    for (QShortcut* shortcut : {open, openEnter}) {
+        connect(shortcut, &QShortcut::activated, this, [this, list] {
+            const QModelIndex current = list->currentIndex();
+            if (list->Model()->GroupAt(current) != nullptr) {
+                list->setExpanded(current, !list->isExpanded(current));
+            } else {
+                OpenResult(SelectedResult(list));
+            }
+        });
+    }
+    // Delete ignores a result of the Results list, and stops ignoring one of the Ignored
+    // Results list; with Shift, all results with its message number.
+    const bool ignoredList = listing == Listing::Ignored;
     auto* ignore = new QShortcut(QKeySequence::Delete, list, nullptr, nullptr, Qt::WidgetShortcut);
-    connect(ignore, &QShortcut::activated, this,
-            [this, list] { IgnoreResult(SelectedResult(list)); });
+    connect(ignore, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringResult(SelectedResult(list));
+        } else {
+            IgnoreResult(SelectedResult(list));
+        }
+    });
     auto* ignoreNumber = new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete), list, nullptr,
                                        nullptr, Qt::WidgetShortcut);
-    connect(ignoreNumber, &QShortcut::activated, this,
-            [this, list] { IgnoreMessageNumber(SelectedResult(list)); });
+    connect(ignoreNumber, &QShortcut::activated, this, [this, list, ignoredList] {
+        if (ignoredList) {
+            StopIgnoringMessageNumber(SelectedResult(list));
+        } else {
+            IgnoreMessageNumber(SelectedResult(list));
+        }
+    });
     return list;
 }
 
+QWidget* frmVerifier::BuildFindBar(QWidget* parent) {
+    auto* bar = new QWidget(parent);
+    bar->setObjectName(QStringLiteral("frameFind"));
+    auto* filterLabel = new QLabel(QStringLiteral("&Filter:"), bar);
+    txtFilter_ = new QLineEdit(bar);
+    txtFilter_->setObjectName(QStringLiteral("txtFilter"));
+    txtFilter_->setPlaceholderText(QStringLiteral("Text in the description or details (Ctrl+F)"));
+    txtFilter_->setClearButtonEnabled(true);
+    filterLabel->setBuddy(txtFilter_);
+    // Typing is followed once it pauses; Enter applies at once.
+    filterTimer_ = new QTimer(this);
+    filterTimer_->setSingleShot(true);
+    filterTimer_->setInterval(150);
+    connect(txtFilter_, &QLineEdit::textChanged, filterTimer_, qOverload<>(&QTimer::start));
+    connect(txtFilter_, &QLineEdit::returnPressed, this, &frmVerifier::ApplyQuery);
+    connect(filterTimer_, &QTimer::timeout, this, &frmVerifier::ApplyQuery);
+
+    auto toggle = [&](const char* name, const QString& text, const QString& tip) {
+        auto* button = new QToolButton(bar);
+        button->setObjectName(QString::fromLatin1(name));
+        button->setText(text);
+        button->setToolTip(tip);
+        button->setCheckable(true);
+        button->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
+        return button;
+    };
+    chkShowErrors_ =
+        toggle("chkShowErrors", QStringLiteral("Errors"), QStringLiteral("Show the errors"));
+    chkShowWarnings_ =
+        toggle("chkShowWarnings", QStringLiteral("Warnings"), QStringLiteral("Show the warnings"));
+    chkShowInfo_ = toggle("chkShowInfo", QStringLiteral("Info"),
+                          QStringLiteral("Show the information results"));
+    chkShowErrors_->setIcon(imlSeverity_->Image(QStringLiteral("Error")));
+    chkShowWarnings_->setIcon(imlSeverity_->Image(QStringLiteral("Warning")));
+    chkShowInfo_->setIcon(imlSeverity_->Image(QStringLiteral("Info")));
+    for (QToolButton* button : {chkShowErrors_, chkShowWarnings_, chkShowInfo_}) {
+        button->setChecked(true);
+        connect(button, &QToolButton::toggled, this, &frmVerifier::ApplyQuery);
+    }
+    chkErrorsFirst_ = toggle("chkErrorsFirst", QStringLiteral("Errors first"),
+                             QStringLiteral("Errors first, then warnings, then information; "
+                                            "otherwise in the order found (Ctrl+E)"));
+    chkErrorsFirst_->setShortcut(QKeySequence(Qt::CTRL | Qt::Key_E));
+    connect(chkErrorsFirst_, &QToolButton::toggled, this, [this](bool errorsFirst) {
+        // One order at a time: errors first, or a column's, or the order found.
+        if (errorsFirst) {
+            for (ResultsView* list : lvResults_)
+                list->header()->setSortIndicator(-1, Qt::AscendingOrder);
+        }
+        ApplyQuery();
+    });
+
+    auto* groupLabel = new QLabel(QStringLiteral("&Group by:"), bar);
+    cboGroupBy_ = new QComboBox(bar);
+    cboGroupBy_->setObjectName(QStringLiteral("cboGroupBy"));
+    cboGroupBy_->addItem(QStringLiteral("None"), static_cast<int>(GroupBy::None));
+    cboGroupBy_->addItem(QStringLiteral("Message"), static_cast<int>(GroupBy::Message));
+    cboGroupBy_->addItem(QStringLiteral("Show"), static_cast<int>(GroupBy::Show));
+    cboGroupBy_->addItem(QStringLiteral("Sequence"), static_cast<int>(GroupBy::Sequence));
+    cboGroupBy_->addItem(QStringLiteral("Sequence pair"), static_cast<int>(GroupBy::SequencePair));
+    cboGroupBy_->setToolTip(
+        QStringLiteral("Gather the results under their message, show, "
+                       "sequence, or the two sequences that conflict"));
+    groupLabel->setBuddy(cboGroupBy_);
+    connect(cboGroupBy_, &QComboBox::currentIndexChanged, this, &frmVerifier::ApplyQuery);
+
+    lblShown_ = new QLabel(bar);
+    lblShown_->setObjectName(QStringLiteral("lblShown"));
+
+    auto* layout = new QHBoxLayout(bar);
+    layout->setContentsMargins(0, 0, 0, 0);
+    layout->addWidget(filterLabel);
+    layout->addWidget(txtFilter_, 1);
+    layout->addWidget(chkShowErrors_);
+    layout->addWidget(chkShowWarnings_);
+    layout->addWidget(chkShowInfo_);
+    layout->addSpacing(8);
+    layout->addWidget(chkErrorsFirst_);
+    layout->addSpacing(8);
+    layout->addWidget(groupLabel);
+    layout->addWidget(cboGroupBy_);
+    layout->addSpacing(8);
+    layout->addWidget(lblShown_);
+
+    auto* find = new QShortcut(QKeySequence::Find, this);
+    connect(find, &QShortcut::activated, this, [this] {
+        txtFilter_->setFocus(Qt::ShortcutFocusReason);
+        txtFilter_->selectAll();
+    });
+    return bar;
+}
+
+ResultQuery frmVerifier::ChosenQuery() const {
+    ResultQuery query;
+    query.filter.text = ToSuiteText(txtFilter_->text().trimmed());
+    query.filter.errors = chkShowErrors_->isChecked();
+    query.filter.warnings = chkShowWarnings_->isChecked();
+    query.filter.info = chkShowInfo_->isChecked();
+    query.order = chkErrorsFirst_->isChecked() ? ResultOrder::ErrorsFirst : ResultOrder::RunOrder;
+    query.groupBy = static_cast<GroupBy>(cboGroupBy_->currentData().toInt());
+    return query;
+}
+
+void frmVerifier::ApplyQuery() {
+    filterTimer_->stop();
+    const ResultQuery query = ChosenQuery();
+    for (ResultsView* list : lvResults_) {
+        const ResultQuery& shown = list->Model()->Query();
+        if (shown.filter.text == query.filter.text && shown.filter.errors == query.filter.errors &&
+            shown.filter.warnings == query.filter.warnings &&
+            shown.filter.info == query.filter.info && shown.order == query.order &&
+            shown.groupBy == query.groupBy)
+            continue;
+        list->Model()->SetQuery(query);
+        // The selected result stays in view.
+        if (list->currentIndex().isValid())
+            list->scrollTo(list->currentIndex());
+    }
+    // What is being looked for is in the lists, not in the log.
+    if (sstDetails_->currentIndex() == OutputLogTab)
+        sstDetails_->setCurrentIndex(ResultsTab);
+    ShowCounts();
+}
+
+void frmVerifier::ShowCounts() {
+    const ResultsView* list = lvResults_[sstDetails_->currentIndex() == IgnoredResultsTab ? 1 : 0];
+    const ResultsModel* model = list->Model();
+    const std::size_t shown = model->ShownCount();
+    lblShown_->setText(
+        QStringLiteral("%1 of %2 shown")
+            .arg(FromSuiteText(FormatCount(static_cast<int64_t>(shown))))
+            .arg(FromSuiteText(FormatCount(static_cast<int64_t>(shown + model->HiddenCount())))));
+}
+
 void frmVerifier::BuildMenus() {
+    // The Results list's pop-up menu.
     mnuResultPopup_ = new QMenu(this);
     mnuResultPopup_->setObjectName(QStringLiteral("mnuResultPopup"));
     mnuHelpOnResult_ = mnuResultPopup_->addAction(QStringLiteral("Help on this result"));
@@ -448,6 +608,34 @@ void frmVerifier::BuildMenus() {
     connect(mnuIgnoreResult_, &QAction::triggered, this, [this] { IgnoreResult(popupResult_); });
     connect(mnuIgnoreMessageNumber_, &QAction::triggered, this,
             [this] { IgnoreMessageNumber(popupResult_); });
+
+    // The Ignored Results list's: the way back.
+    mnuIgnoredPopup_ = new QMenu(this);
+    mnuIgnoredPopup_->setObjectName(QStringLiteral("mnuIgnoredPopup"));
+    QAction* help = mnuIgnoredPopup_->addAction(QStringLiteral("Help on this result"));
+    help->setShortcut(QKeySequence(Qt::Key_F1));
+    mnuIgnoredPopup_->addSeparator();
+    mnuStopIgnoringResult_ =
+        mnuIgnoredPopup_->addAction(QStringLiteral("Stop ignoring this result"));
+    mnuStopIgnoringResult_->setObjectName(QStringLiteral("mnuStopIgnoringResult"));
+    mnuStopIgnoringResult_->setShortcut(QKeySequence::Delete);
+    mnuStopIgnoringMessageNumber_ = mnuIgnoredPopup_->addAction(
+        QStringLiteral("Stop ignoring all results with this message number"));
+    mnuStopIgnoringMessageNumber_->setObjectName(QStringLiteral("mnuStopIgnoringMessageNumber"));
+    mnuStopIgnoringMessageNumber_->setShortcut(QKeySequence(Qt::SHIFT | Qt::Key_Delete));
+    connect(help, &QAction::triggered, this, [this] { HelpOnResult(popupResult_); });
+    connect(mnuStopIgnoringResult_, &QAction::triggered, this,
+            [this] { StopIgnoringResult(popupResult_); });
+    connect(mnuStopIgnoringMessageNumber_, &QAction::triggered, this,
+            [this] { StopIgnoringMessageNumber(popupResult_); });
+
+    // Both: the result as text.
+    for (QMenu* menu : {mnuResultPopup_, mnuIgnoredPopup_}) {
+        menu->addSeparator();
+        QAction* copy = menu->addAction(QStringLiteral("Copy"));
+        copy->setShortcut(QKeySequence::Copy);
+        connect(copy, &QAction::triggered, this, [this] { CopyResult(popupResult_); });
+    }
 
     // Keyboard access to the commands beyond the buttons' own letters.
     auto addShortcut = [this](const QKeySequence& keys, auto&& command) {
@@ -488,8 +676,8 @@ void frmVerifier::LoadPlacement() {
     const QByteArray geometry = settings.value(kGeometryKey).toByteArray();
     if (!geometry.isEmpty())
         restoreGeometry(geometry);
-    txtTargetSequence_->setText(settings.value(kTargetSequenceKey).toString());
-    txtTargetShow_->setText(settings.value(kTargetShowKey).toString());
+    txtTargetSequence_->setText(AbsoluteTarget(settings.value(kTargetSequenceKey).toString()));
+    txtTargetShow_->setText(AbsoluteTarget(settings.value(kTargetShowKey).toString()));
     const QString kind = settings.value(kTargetKindKey).toString();
     if (kind == QLatin1String("sequence")) {
         optTargetSequence_->setChecked(true);
@@ -503,8 +691,8 @@ void frmVerifier::LoadPlacement() {
 void frmVerifier::SavePlacement() const {
     QSettings settings(settingsFile_, QSettings::IniFormat);
     settings.setValue(kGeometryKey, saveGeometry());
-    settings.setValue(kTargetSequenceKey, txtTargetSequence_->text());
-    settings.setValue(kTargetShowKey, txtTargetShow_->text());
+    settings.setValue(kTargetSequenceKey, AbsoluteTarget(txtTargetSequence_->text()));
+    settings.setValue(kTargetShowKey, AbsoluteTarget(txtTargetShow_->text()));
     settings.setValue(kTargetKindKey, optTargetSequence_->isChecked() ? QStringLiteral("sequence")
                                       : optTargetShow_->isChecked()   ? QStringLiteral("show")
                                                                       : QStringLiteral("schedule"));
@@ -550,9 +738,10 @@ void frmVerifier::dropEvent(QDropEvent* event) {
         event->acceptProposedAction();
 }
 
-bool frmVerifier::SetTargetFile(const QString& path) {
+bool frmVerifier::SetTargetFile(const QString& file) {
     if (running_)
         return false;
+    const QString path = AbsoluteTarget(file);
     switch (KindOfFile(path)) {
         case TargetKind::Sequence:
             txtTargetSequence_->setText(path);
@@ -574,7 +763,7 @@ void frmVerifier::SetRunning(bool running) {
     running_ = running;
     if (!running) {
         FlushLog();
-        setUpdatesEnabled(true);
+        TakeNewResults(true);
         repaintClock_.invalidate();
         lblStatus_->setText(statusText_);
     }
@@ -591,6 +780,8 @@ void frmVerifier::ResetSummary() {
         count->setText(QStringLiteral("0"));
     prgVerification_->setRange(0, 1);
     prgVerification_->setValue(0);
+    runCancelled_ = false;
+    checksDropped_ = 0;
 }
 
 void frmVerifier::SummaryChanged() {
@@ -613,11 +804,16 @@ void frmVerifier::RefreshSummary() {
     const int32_t remaining = LibVerify::ChecksRemainingCount();
     lblChecksPerformedCount_->setText(QString::number(performed));
     lblChecksRemainingCount_->setText(QString::number(remaining));
-    lblErrorsCount_->setText(QString::number(LibVerify::ErrorCount()));
-    lblWarningsCount_->setText(QString::number(LibVerify::WarningCount()));
-    const int total = std::max(1, performed + remaining);
+    // The errors and warnings of the Results list (whatever its filter hides): as the
+    // driver counts them until the user ignores or stops ignoring a result.
+    const SeverityCounts listed = grouping_.Counts(Listing::NotIgnored);
+    lblErrorsCount_->setText(QString::number(listed.errors));
+    lblWarningsCount_->setText(QString::number(listed.warnings));
+    // A cancelled run stops short of the checks it dropped, and says so.
+    const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
     prgVerification_->setValue(std::min(performed, total));
+    prgVerification_->setFormat(runCancelled_ ? QStringLiteral("Cancelled") : kProgressFormat);
 }
 
 // --- The output log ------------------------------------------------------------------------
@@ -628,15 +824,39 @@ QColor ToQColor(const OutputLog::Colour& colour) {
     return QColor(colour.red, colour.green, colour.blue);
 }
 
-}  // namespace
+// Each line of the log carries what its colour stands for, so that it can be coloured again
+// when the palette changes: a severity's number, or kPlainLine.
+constexpr int kLogLineKind = QTextFormat::UserProperty + 1;
+constexpr int kPlainLine = -1;
 
-QColor frmVerifier::SeverityColour(Severity severity) {
-    return ToQColor(OutputLog::ResultColour(severity));
+bool IsDarkPage(const QPalette& palette) {
+    return palette.color(QPalette::Base).lightness() < 128;
 }
 
-void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
+}  // namespace
+
+QColor frmVerifier::LogColour(int kind, const QPalette& palette) {
+    const bool dark = IsDarkPage(palette);
+    if (kind == kPlainLine)
+        return dark ? palette.color(QPalette::Text) : ToQColor(OutputLog::kBlack);
+    const auto severity = static_cast<Severity>(kind);
+    if (!dark)
+        return ToQColor(OutputLog::ResultColour(severity));
+    // On a dark page the same hues, lighter, so that they stand out as well as on a light one.
+    switch (severity) {
+        case Severity::Info:
+            return QColor(110, 160, 255);
+        case Severity::Warning:
+            return QColor(255, 170, 70);
+        case Severity::Error:
+            return QColor(255, 110, 110);
+    }
+    return palette.color(QPalette::Text);
+}
+
+void frmVerifier::WriteLog(const QString& text, int kind) {
     // The time stamp is taken now, whenever the line reaches the screen.
-    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), colour});
+    pendingLog_.append({FromSuiteText(OutputLog::FormatLine(ToSuiteText(text))), kind});
     if (!running_)
         FlushLog();
 }
@@ -644,12 +864,14 @@ void frmVerifier::WriteLog(const QString& text, const QColor& colour) {
 void frmVerifier::FlushLog() {
     if (pendingLog_.isEmpty())
         return;
+    const QPalette palette = rtxOutputLog_->palette();
     QTextCursor cursor(rtxOutputLog_->document());
     cursor.movePosition(QTextCursor::End);
     cursor.beginEditBlock();
     for (const LogLine& line : std::as_const(pendingLog_)) {
         QTextCharFormat format;
-        format.setForeground(line.colour);
+        format.setForeground(LogColour(line.kind, palette));
+        format.setProperty(kLogLineKind, line.kind);
         // Every line ends with a line break, so the document ends with an empty block.
         cursor.insertText(line.text + QLatin1Char('\n'), format);
     }
@@ -660,10 +882,36 @@ void frmVerifier::FlushLog() {
     scrollBar->setValue(scrollBar->maximum());
 }
 
+void frmVerifier::RecolourLog() {
+    const QPalette palette = rtxOutputLog_->palette();
+    QTextDocument* document = rtxOutputLog_->document();
+    QTextCursor cursor(document);
+    cursor.beginEditBlock();
+    for (QTextBlock block = document->begin(); block.isValid(); block = block.next()) {
+        for (auto fragment = block.begin(); !fragment.atEnd(); ++fragment) {
+            const QTextFragment piece = fragment.fragment();
+            QTextCharFormat format = piece.charFormat();
+            if (!format.hasProperty(kLogLineKind))
+                continue;
+            format.setForeground(LogColour(format.intProperty(kLogLineKind), palette));
+            cursor.setPosition(piece.position());
+            cursor.setPosition(piece.position() + piece.length(), QTextCursor::KeepAnchor);
+            cursor.setCharFormat(format);
+        }
+    }
+    cursor.endEditBlock();
+}
+
+bool frmVerifier::eventFilter(QObject* watched, QEvent* event) {
+    if (watched == rtxOutputLog_ && event->type() == QEvent::PaletteChange)
+        RecolourLog();
+    return QMainWindow::eventFilter(watched, event);
+}
+
 // --- Notification handlers -----------------------------------------------------------------
 
 void frmVerifier::CheckAdded(ICheck& check) {
-    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), ToQColor(OutputLog::kBlack));
+    WriteLog(FromSuiteText(OutputLog::CheckAddedText(check)), kPlainLine);
     SummaryChanged();
 }
 
@@ -673,13 +921,17 @@ void frmVerifier::CheckCompleted(ICheck&) {
 
 void frmVerifier::Checking(ICheck& check) {
     const QString text = FromSuiteText(OutputLog::CheckingText(check));
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
 void frmVerifier::ChecksCompleted(bool cancelled) {
-    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), ToQColor(OutputLog::kBlack));
-    SetStatus(QString());
+    WriteLog(FromSuiteText(OutputLog::ChecksCompletedText(cancelled)), kPlainLine);
+    runCancelled_ = cancelled;
+    SetStatus(cancelled ? QStringLiteral("Cancelled: %1 of %2 checks performed")
+                              .arg(LibVerify::ChecksPerformedCount())
+                              .arg(LibVerify::ChecksPerformedCount() + checksDropped_)
+                        : QString());
     SetRunning(false);
     RefreshSummary();
     sstDetails_->setCurrentIndex(ResultsTab);
@@ -688,25 +940,29 @@ void frmVerifier::ChecksCompleted(bool cancelled) {
 void frmVerifier::Initializing() {
     pendingLog_.clear();
     rtxOutputLog_->clear();
-    lvResults_[0]->clear();
-    lvResults_[1]->clear();
+    grouping_.Clear();
+    for (ResultsView* list : lvResults_)
+        list->Model()->Clear();
     popupResult_.reset();
-    resultsListed_ = 0;
+    fraResultDetails_->ShowResult(nullptr);
+    ShowCounts();
     SetStatus(QString());
     sstDetails_->setCurrentIndex(OutputLogTab);
 }
 
 void frmVerifier::ResultAdded(const ResultPtr& result) {
-    QTreeWidget* list = result->Ignorable() ? lvResults_[1] : lvResults_[0];
-    AddResultItem(list, result, resultsListed_++);
+    grouping_.Add(result, result->Ignorable());
+    // While a run goes, the lists take new results when the window is drawn.
+    if (!running_)
+        TakeNewResults(true);
     SummaryChanged();
-    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), SeverityColour(result->Severity()));
+    WriteLog(FromSuiteText(OutputLog::ResultText(*result)), static_cast<int>(result->Severity()));
     LibVerify::ProcessPendingEvents();
 }
 
 void frmVerifier::TransientMessage(const std::string& message) {
     const QString text = FromSuiteText(message);
-    WriteLog(text, ToQColor(OutputLog::kBlack));
+    WriteLog(text, kPlainLine);
     SetStatus(text);
 }
 
@@ -716,96 +972,91 @@ void frmVerifier::VerificationCancelled() {
 
 // --- The result lists ----------------------------------------------------------------------
 
-ResultPtr frmVerifier::ResultOf(const QTreeWidgetItem* item) {
-    const auto* resultItem = dynamic_cast<const ResultItem*>(item);
-    return resultItem != nullptr ? resultItem->Result() : nullptr;
+ResultPtr frmVerifier::ResultOf(const QModelIndex& index) {
+    const auto* model = qobject_cast<const ResultsModel*>(index.model());
+    return model != nullptr ? model->ResultAt(index) : nullptr;
 }
 
-void frmVerifier::AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order) {
-    auto* item = new ResultItem(result, order);
-    const QString severity = FromSuiteText(result->SeverityText());
-    item->setText(DescriptionColumn, FromSuiteText(result->Summary()));
-    item->setIcon(DescriptionColumn, imlSeverity_->Image(severity));
-    item->setText(SeverityColumn, severity);
-    item->setText(MsgNumColumn, QString::number(result->MessageNumber()));
-    QStringList details;
-    const std::vector<std::string>& resultDetails = result->Details();
-    for (std::size_t i = 0; i < resultDetails.size(); ++i) {
-        const QString detail = FromSuiteText(resultDetails[i]);
-        details.append(detail);
-        if (i < static_cast<std::size_t>(kDetailColumns))
-            item->setText(Details1Column + static_cast<int>(i), detail);
+void frmVerifier::TakeNewResults(bool now) {
+    // A list that is not on view and simply appends takes its new rows every time: that is
+    // cheap. A list on view lays all its rows out again whenever it gains some, and one that
+    // is grouped, ordered or sorted is rebuilt: while a run goes, those take new results at
+    // most every kRelayoutIntervalMs.
+    const bool due =
+        now || !relayoutClock_.isValid() || relayoutClock_.hasExpired(kRelayoutIntervalMs);
+    bool changed = false;
+    for (ResultsView* list : lvResults_) {
+        ResultsModel* model = list->Model();
+        if (due || (model->Appends() && !list->isVisible()))
+            changed = model->TakeNewResults() || changed;
     }
-    QString tip = item->text(DescriptionColumn);
-    if (!details.isEmpty())
-        tip += QLatin1Char('\n') + details.join(QLatin1Char('\n'));
-    item->setToolTip(DescriptionColumn, tip);
-    list->addTopLevelItem(item);
+    if (due)
+        relayoutClock_.restart();
+    if (changed)
+        ShowCounts();
 }
 
-void frmVerifier::MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item) {
-    auto* resultItem =
-        static_cast<ResultItem*>(from->takeTopLevelItem(from->indexOfTopLevelItem(item)));
-    if (resultItem == nullptr)
-        return;
-    // Unsorted lists keep the order produced: the item goes before the first one listed
-    // after it. A sorted list places it itself.
-    int index = to->topLevelItemCount();
-    if (to->sortColumn() < 0) {
-        for (int i = 0; i < to->topLevelItemCount(); ++i) {
-            const auto* other = static_cast<const ResultItem*>(to->topLevelItem(i));
-            if (other->Order() > resultItem->Order()) {
-                index = i;
-                break;
+void frmVerifier::RelayoutLists() {
+    for (ResultsView* list : lvResults_) {
+        // A result that leaves the list (ignored, say) hands the selection to the row that
+        // takes its place, so that the next one can be dealt with at once.
+        const QModelIndex current = list->currentIndex();
+        const int row = current.row();
+        const QPersistentModelIndex parent = current.parent();
+        list->Model()->Relayout();
+        if (current.isValid() && !list->currentIndex().isValid()) {
+            ResultsModel* model = list->Model();
+            const QModelIndex within = parent.isValid() ? QModelIndex(parent) : QModelIndex();
+            const int rows = model->rowCount(within);
+            if (rows > 0) {
+                const QModelIndex next = model->index(std::min(row, rows - 1), 0, within);
+                list->setCurrentIndex(next);
             }
         }
     }
-    to->insertTopLevelItem(index, resultItem);
+    ShowCounts();
 }
 
 void frmVerifier::RefreshIgnoredResults() {
-    QTreeWidget* results = lvResults_[0];
-    QTreeWidget* ignored = lvResults_[1];
-    QList<QTreeWidgetItem*> toIgnored;
-    for (int i = 0; i < results->topLevelItemCount(); ++i) {
-        const ResultPtr result = ResultOf(results->topLevelItem(i));
-        if (result && result->Ignorable())
-            toIgnored.append(results->topLevelItem(i));
+    TakeNewResults(true);
+    bool moved = false;
+    for (std::size_t i = 0; i < grouping_.Size(); ++i) {
+        const bool ignored = grouping_.At(i)->Ignorable();
+        if (ignored != grouping_.Ignored(i)) {
+            grouping_.SetIgnored(i, ignored);
+            moved = true;
+        }
     }
-    QList<QTreeWidgetItem*> toResults;
-    for (int i = 0; i < ignored->topLevelItemCount(); ++i) {
-        const ResultPtr result = ResultOf(ignored->topLevelItem(i));
-        if (result && !result->Ignorable())
-            toResults.append(ignored->topLevelItem(i));
-    }
-    for (QTreeWidgetItem* item : toIgnored)
-        MoveItem(results, ignored, item);
-    for (QTreeWidgetItem* item : toResults)
-        MoveItem(ignored, results, item);
+    if (!moved)
+        return;
+    RelayoutLists();
+    SummaryChanged();
 }
 
-ResultPtr frmVerifier::SelectedResult(const QTreeWidget* list) const {
-    const QList<QTreeWidgetItem*> selected = list->selectedItems();
-    if (!selected.isEmpty())
-        return ResultOf(selected.constFirst());
-    return nullptr;
+ResultPtr frmVerifier::SelectedResult(const ResultsView* list) const {
+    const QModelIndex current = list->currentIndex();
+    if (!current.isValid() || !list->selectionModel()->isSelected(current))
+        return nullptr;
+    return ResultOf(current);
 }
 
-void frmVerifier::ShowResultPopup(QTreeWidget* list, const QPoint& position) {
-    QTreeWidgetItem* item = list->itemAt(list->viewport()->mapFrom(list, position));
-    QPoint at = position;
-    if (item == nullptr) {
-        // From the keyboard (the menu key): the current item.
-        item = list->currentItem();
-        if (item == nullptr)
-            return;
-        at = list->viewport()->mapTo(list, list->visualItemRect(item).bottomLeft());
-    }
-    list->setCurrentItem(item);
-    popupResult_ = ResultOf(item);
+void frmVerifier::ShowResultPopup(ResultsView* list, const QModelIndex& index,
+                                  const QPoint& globalPosition) {
+    popupResult_ = ResultOf(index);
     if (!popupResult_)
         return;
-    mnuResultPopup_->popup(list->mapToGlobal(at));
+    list->setCurrentIndex(index);
+    QMenu* menu = mnuResultPopup_;
+    if (list == lvResults_[1]) {
+        // An ignored result is listed for its own key, its message number, or both: each
+        // entry offers to take away what is there.
+        mnuStopIgnoringResult_->setEnabled(
+            IgnoreLists::IsIgnoreKeyIgnored(popupResult_->IgnoreKey()));
+        mnuStopIgnoringMessageNumber_->setEnabled(
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(popupResult_->MessageNumber())));
+        menu = mnuIgnoredPopup_;
+    }
+    menu->popup(globalPosition);
 }
 
 // --- Commands ------------------------------------------------------------------------------
@@ -830,14 +1081,16 @@ void frmVerifier::ShowError(const QString& title, const QString& text) {
 
 void frmVerifier::ApplyTarget() {
     if (optTargetShow_->isChecked()) {
-        const QString show = txtTargetShow_->text().trimmed();
+        const QString show = AbsoluteTarget(txtTargetShow_->text());
         if (show.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the show file to verify");
+        txtTargetShow_->setText(show);
         LibVerify::VerifyShowFile(ToSuiteText(show));
     } else if (optTargetSequence_->isChecked()) {
-        const QString sequence = txtTargetSequence_->text().trimmed();
+        const QString sequence = AbsoluteTarget(txtTargetSequence_->text());
         if (sequence.isEmpty())
             Raise(ErrorNumbers::UserMessage, kSource, "Please specify the sequence file to verify");
+        txtTargetSequence_->setText(sequence);
         LibVerify::VerifySequenceFile(ToSuiteText(sequence));
     } else {
         LibVerify::SetScheduleFiles(VTRCommon::GetWeeklyScheduleFile(),
@@ -870,7 +1123,12 @@ void frmVerifier::Verify() {
 }
 
 void frmVerifier::Cancel() {
-    Guarded(kVerifierError, [] { LibVerify::CancelVerification(); });
+    Guarded(kVerifierError, [this] {
+        // The queue is emptied: the progress bar keeps room for what it held.
+        if (running_ && !LibVerify::IsCancelled())
+            checksDropped_ = LibVerify::ChecksRemainingCount();
+        LibVerify::CancelVerification();
+    });
 }
 
 std::string frmVerifier::ChooseResultsReportFile() {
@@ -933,21 +1191,67 @@ void frmVerifier::OpenResult(const ResultPtr& result) {
 }
 
 void frmVerifier::IgnoreResult(const ResultPtr& result) {
-    if (!result)
-        return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreResult(*result);
-        RefreshIgnoredResults();
-    });
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreResult(*result); });
 }
 
 void frmVerifier::IgnoreMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::IgnoreMessageNumber(result->MessageNumber()); });
+}
+
+void frmVerifier::StopIgnoringResult(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreResult(*result); });
+}
+
+void frmVerifier::StopIgnoringMessageNumber(const ResultPtr& result) {
+    ChangeIgnoreLists(result, [&] { IgnoreLists::UnignoreMessageNumber(result->MessageNumber()); });
+}
+
+template <typename Change>
+void frmVerifier::ChangeIgnoreLists(const ResultPtr& result, Change&& change) {
     if (!result)
         return;
-    Guarded(kVerifierError, [&] {
-        IgnoreLists::IgnoreMessageNumber(result->MessageNumber());
+    Guarded(kIgnoreListError, [&] {
+        change();
         RefreshIgnoredResults();
     });
+    // What the result is ignored by may have changed, whether or not it moved.
+    ShowSelectedResult();
+}
+
+void frmVerifier::CopyResult(const ResultPtr& result) {
+    if (result)
+        QApplication::clipboard()->setText(ResultDetailsPane::ResultText(*result));
+}
+
+void frmVerifier::OpenFolder(const QString& folder) {
+    if (!dialogs_->OpenFolder(this, folder))
+        ShowError(kOpenFolderError, QStringLiteral("Cannot open the folder %1").arg(folder));
+}
+
+void frmVerifier::ShowSelectedResult() {
+    const int tab = sstDetails_->currentIndex();
+    fraResultDetails_->setVisible(tab != OutputLogTab);
+    if (tab == OutputLogTab)
+        return;
+    const bool ignoredList = tab == IgnoredResultsTab;
+    const ResultPtr result = SelectedResult(lvResults_[ignoredList ? 1 : 0]);
+    if (!result) {
+        fraResultDetails_->ShowResult(nullptr);
+        return;
+    }
+    QString ignoredBy;
+    if (ignoredList) {
+        const bool byKey = IgnoreLists::IsIgnoreKeyIgnored(result->IgnoreKey());
+        const bool byNumber =
+            IgnoreLists::IsMessageNumberIgnored(std::to_string(result->MessageNumber()));
+        const QString number =
+            QStringLiteral("all results with message number %1").arg(result->MessageNumber());
+        ignoredBy = byKey && byNumber ? QStringLiteral("this result, and ") + number
+                    : byKey           ? QStringLiteral("this result")
+                                      : number;
+    }
+    fraResultDetails_->ShowResult(
+        result, imlSeverity_->Image(FromSuiteText(result->SeverityText())), ignoredBy);
 }
 
 void frmVerifier::ChooseTargetSequence() {

@@ -11,10 +11,13 @@
 
 #include "DialogPresenter.h"
 #include "HelpProvider.h"
+#include "ResultsModel.h"
 #include "engine/INotificationClient.h"
 #include "engine/Result.h"
+#include "engine/ResultGrouping.h"
 
 class QAction;
+class QComboBox;
 class QGroupBox;
 class QLabel;
 class QLineEdit;
@@ -24,10 +27,13 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTabWidget;
-class QTreeWidget;
-class QTreeWidgetItem;
+class QTimer;
+class QToolButton;
 
 namespace vtr {
+
+class ResultDetailsPane;
+class ResultsView;
 
 // The three severity images of the result lists, keyed "Info", "Warning" and "Error".
 class SeverityImageList : public QObject {
@@ -65,7 +71,12 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // The tabs of sstDetails, in order.
     enum Tab { OutputLogTab = 0, ResultsTab = 1, IgnoredResultsTab = 2 };
     // The columns of both result lists.
-    enum Column { DescriptionColumn = 0, SeverityColumn = 1, MsgNumColumn = 2, Details1Column = 3 };
+    enum Column {
+        DescriptionColumn = ResultsModel::DescriptionColumn,
+        SeverityColumn = ResultsModel::SeverityColumn,
+        MsgNumColumn = ResultsModel::MsgNumColumn,
+        Details1Column = ResultsModel::Details1Column
+    };
 
     // Loads the window: caption, notification client, help, the event pump and busy pointer
     // hooks, and the driver's collections (BeginVerification once).
@@ -99,11 +110,21 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void HelpOnResult(const ResultPtr& result);
     void IgnoreResult(const ResultPtr& result);
     void IgnoreMessageNumber(const ResultPtr& result);
+    // The Ignored Results list's: take the result's key, or its message number, off the
+    // ignore lists (as the command line's unignore does); what is no longer ignored moves
+    // back to the Results list.
+    void StopIgnoringResult(const ResultPtr& result);
+    void StopIgnoringMessageNumber(const ResultPtr& result);
+    // Puts a result on the clipboard as text (the pop-up menus' "Copy", Ctrl+C).
+    void CopyResult(const ResultPtr& result);
+    // Shows a folder in the desktop's file manager ("Open containing folder").
+    void OpenFolder(const QString& folder);
     // A double-click (or Enter) on an item: help on its result.
     void OpenResult(const ResultPtr& result);
 
     // Chooses a file as the target by its kind: "lss" a show, "las"/"lms" a sequence
-    // (any letter case). False, with nothing changed, for anything else or while running.
+    // (any letter case), named by its absolute path (a relative one is taken from the working
+    // folder). False, with nothing changed, for anything else or while running.
     bool SetTargetFile(const QString& path);
 
     // The report dialog: the chosen file name, or "" when the user cancelled.
@@ -113,15 +134,20 @@ class frmVerifier : public QMainWindow, public INotificationClient {
 
     // Moves every listed result to the list its Ignorable now calls for.
     void RefreshIgnoredResults();
+    // The lists' filter, order and grouping, as the controls above the lists choose them.
+    ResultQuery ChosenQuery() const;
     // Sets the four count labels from the driver's counts.
     void RefreshSummary();
-    // Writes one line to the output log: time stamp, ": ", the text, in that colour.
-    void WriteLog(const QString& text, const QColor& colour);
+    // Writes one line to the output log: time stamp, ": ", the text, in the colour of its
+    // kind (a severity's number for a result's line, -1 for any other).
+    void WriteLog(const QString& text, int kind);
 
-    // The log colour of a severity: Info blue, Warning orange, Error red, others black.
-    static QColor SeverityColour(Severity severity);
-    // The result behind a list item (the item's tag); null for anything else.
-    static ResultPtr ResultOf(const QTreeWidgetItem* item);
+    // The log colour of a line's kind on a page of that palette. On a light page: Info
+    // blue, Warning orange, Error red, other lines black. On a dark one: lighter tones of the
+    // same, other lines in the palette's text colour.
+    static QColor LogColour(int kind, const QPalette& palette);
+    // The result of a row of either list; null for a group's row or anything else.
+    static ResultPtr ResultOf(const QModelIndex& index);
 
     bool IsRunning() const { return running_; }
 
@@ -130,13 +156,16 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void VerificationFinished(bool cancelled);
 
   protected:
+    bool eventFilter(QObject* watched, QEvent* event) override;
     void closeEvent(QCloseEvent* event) override;
     void dragEnterEvent(QDragEnterEvent* event) override;
     void dropEvent(QDropEvent* event) override;
 
   private:
     void BuildControls();
-    QTreeWidget* BuildResultList(const QString& name);
+    ResultsView* BuildResultList(const QString& name, Listing listing);
+    // The filter box, the severity toggles, errors first, group by, and "N of M shown".
+    QWidget* BuildFindBar(QWidget* parent);
     void BuildMenus();
     void InstallPlatformHooks();
     // The event pump the core calls while a run goes.
@@ -151,13 +180,28 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     void SetStatus(const QString& text);
     // Writes the log lines kept back while a run goes.
     void FlushLog();
+    // Colours every line of the log again, for the palette now in use.
+    void RecolourLog();
     void ResetSummary();
     void ApplyTarget();
     void ChooseTarget(bool sequence);
-    void AddResultItem(QTreeWidget* list, const ResultPtr& result, qint64 order);
-    void MoveItem(QTreeWidget* from, QTreeWidget* to, QTreeWidgetItem* item);
-    void ShowResultPopup(QTreeWidget* list, const QPoint& position);
-    ResultPtr SelectedResult(const QTreeWidget* list) const;
+    // The lists take the results added since they last looked: now, or (while a run goes)
+    // as often as each list can afford.
+    void TakeNewResults(bool now);
+    // Both lists laid out again from the grouping, keeping the selected row in view.
+    void RelayoutLists();
+    // Applies the chosen filter, order and grouping to both lists.
+    void ApplyQuery();
+    // "N of M shown" for the list on view.
+    void ShowCounts();
+    void ShowResultPopup(ResultsView* list, const QModelIndex& index, const QPoint& globalPosition);
+    // The details pane follows the selected result of the list shown.
+    void ShowSelectedResult();
+    ResultPtr SelectedResult(const ResultsView* list) const;
+    // Changes the ignore lists for a result and moves the listed results accordingly; a
+    // failure is shown under "Ignore List Error".
+    template <typename Change>
+    void ChangeIgnoreLists(const ResultPtr& result, Change&& change);
     // Runs a command; a failure is shown in a message box with that title.
     template <typename Command>
     void Guarded(const QString& title, Command&& command);
@@ -179,8 +223,20 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // Details.
     QTabWidget* sstDetails_ = nullptr;
     QPlainTextEdit* rtxOutputLog_ = nullptr;
-    QTreeWidget* lvResults_[2] = {nullptr, nullptr};
+    // The run's results, for both lists; each list is a view of it.
+    ResultGrouping grouping_;
+    ResultsView* lvResults_[2] = {nullptr, nullptr};
+    // Finding what matters.
+    QLineEdit* txtFilter_ = nullptr;
+    QToolButton* chkShowErrors_ = nullptr;
+    QToolButton* chkShowWarnings_ = nullptr;
+    QToolButton* chkShowInfo_ = nullptr;
+    QToolButton* chkErrorsFirst_ = nullptr;
+    QComboBox* cboGroupBy_ = nullptr;
+    QLabel* lblShown_ = nullptr;
+    QTimer* filterTimer_ = nullptr;
     SeverityImageList* imlSeverity_ = nullptr;
+    ResultDetailsPane* fraResultDetails_ = nullptr;
     // Summary.
     QGroupBox* frameSummary_ = nullptr;
     QLabel* lblChecksPerformedCount_ = nullptr;
@@ -198,6 +254,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QAction* mnuHelpOnResult_ = nullptr;
     QAction* mnuIgnoreResult_ = nullptr;
     QAction* mnuIgnoreMessageNumber_ = nullptr;
+    QMenu* mnuIgnoredPopup_ = nullptr;
+    QAction* mnuStopIgnoringResult_ = nullptr;
+    QAction* mnuStopIgnoringMessageNumber_ = nullptr;
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
     static constexpr qint64 kRepaintIntervalMs = 50;
@@ -205,13 +264,17 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     bool summaryPending_ = false;
     struct LogLine {
         QString text;
-        QColor colour;
+        int kind;
     };
     QList<LogLine> pendingLog_;
     QString statusText_;
     bool running_ = false;
+    bool runCancelled_ = false;  // the last run ended by cancellation
+    int checksDropped_ = 0;      // the checks its cancellation dropped from the queue
     bool closeWhenFinished_ = false;
-    qint64 resultsListed_ = 0;  // the order of the next result listed
+    // How often lists that must be laid out whole take new results while a run goes.
+    static constexpr qint64 kRelayoutIntervalMs = 400;
+    QElapsedTimer relayoutClock_;
 };
 
 }  // namespace vtr

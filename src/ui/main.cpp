@@ -5,6 +5,7 @@
 // --registry names the settings store to use (a registry-export file), as for the command
 // line; TARGET, a show (.lss) or sequence (.las, .lms) file, is filled in as the target.
 #include <QApplication>
+#include <QCommandLineOption>
 #include <QCommandLineParser>
 #include <QMessageBox>
 #include <exception>
@@ -16,34 +17,66 @@
 #include "environment/RegistryStore.h"
 #include "frmVerifier.h"
 
-int main(int argc, char** argv) {
-    QApplication application(argc, argv);
-    QApplication::setOrganizationName(QStringLiteral("Vantori"));
-    QApplication::setApplicationName(QStringLiteral("vantori-verifier"));
-    QApplication::setApplicationDisplayName(QStringLiteral("Vantori Verifier"));
-    QApplication::setApplicationVersion(QString::fromLatin1(vtr::kVersionText));
+namespace {
 
+// The program's options and arguments, the same for both readings of the command line.
+struct CommandLine {
     QCommandLineParser parser;
-    parser.setApplicationDescription(
-        QStringLiteral("Verifies a Vantori show-lighting installation before the show runs."));
-    parser.addHelpOption();
-    parser.addVersionOption();
-    const QCommandLineOption registry(
+    QCommandLineOption help;
+    QCommandLineOption version;
+    QCommandLineOption registry{
         QStringList{QStringLiteral("registry")},
         QStringLiteral("The settings store to use: a registry-export file."),
-        QStringLiteral("FILE"));
-    parser.addOption(registry);
-    parser.addPositionalArgument(QStringLiteral("target"),
-                                 QStringLiteral("A show (.lss) or sequence (.las, .lms) file to "
-                                                "verify."),
-                                 QStringLiteral("[TARGET]"));
-    parser.process(application);
+        QStringLiteral("FILE")};
+
+    CommandLine() : help(parser.addHelpOption()), version(parser.addVersionOption()) {
+        parser.setApplicationDescription(
+            QStringLiteral("Verifies a Vantori show-lighting installation before the show runs."));
+        parser.addOption(registry);
+        parser.addPositionalArgument(QStringLiteral("target"),
+                                     QStringLiteral("A show (.lss) or sequence (.las, .lms) file "
+                                                    "to verify."),
+                                     QStringLiteral("[TARGET]"));
+    }
+};
+
+void SetApplicationNames() {
+    QCoreApplication::setOrganizationName(QStringLiteral("Vantori"));
+    QCoreApplication::setApplicationName(QStringLiteral("vantori-verifier"));
+    QCoreApplication::setApplicationVersion(QString::fromLatin1(vtr::kVersionText));
+}
+
+// --help and --version are answered without a window system, so that they work where there
+// is no display (a terminal on a server, a build machine): the first reading happens before
+// the window's application exists, and ends the program when either is asked for.
+void AnswerHelpAndVersion(int argc, char** argv) {
+    QCoreApplication application(argc, argv);
+    CommandLine commandLine;
+    // Errors (and the window system's own options) are left to the second reading.
+    commandLine.parser.parse(QCoreApplication::arguments());
+    if (commandLine.parser.isSet(commandLine.help))
+        commandLine.parser.showHelp(0);
+    if (commandLine.parser.isSet(commandLine.version))
+        commandLine.parser.showVersion();
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    SetApplicationNames();
+    AnswerHelpAndVersion(argc, argv);
+
+    QApplication application(argc, argv);
+    QApplication::setApplicationDisplayName(QStringLiteral("Vantori Verifier"));
+    CommandLine commandLine;
+    commandLine.parser.process(application);
+    const QCommandLineParser& parser = commandLine.parser;
 
     try {
         // The store is chosen before anything reads a setting.
         std::optional<std::string> store;
-        if (parser.isSet(registry))
-            store = vtr::ToSuiteText(parser.value(registry));
+        if (parser.isSet(commandLine.registry))
+            store = vtr::ToSuiteText(parser.value(commandLine.registry));
         vtr::RegistryStore::Select(store);
 
         vtr::frmVerifier window;

@@ -101,13 +101,62 @@ TEST_F(IgnoreCommandsTest, AnEmptyStoreListsNothingAndIsNotCreatedByListing) {
 
 TEST_F(IgnoreCommandsTest, AKeyNoResultCanHaveIsWrongUsageAndChangesNothing) {
     WriteStore("Windows Registry Editor Version 5.00\r\n");
-    for (const char* key : {"", "23", "-23", "x-a / ", "23-a", "23-a /", "023-a / ", "+5-"}) {
+    for (const char* key : {"", "23", "-23", "x-a / ", "023-a / ", "+5-", "escaped:7-a\\",
+                            "escaped:7-\\q", "escaped:7-\\x4"}) {
         const Outcome outcome = Run({"ignore", "--key", key});
         EXPECT_EQ(outcome.status, 64) << key;
         EXPECT_EQ(outcome.out, "") << key;
         EXPECT_THAT(outcome.err, HasSubstr("is not a result's key")) << key;
     }
     EXPECT_EQ(ReadStore(), "Windows Registry Editor Version 5.00\r\n");
+}
+
+TEST_F(IgnoreCommandsTest, AKeyIsTakenWithOrWithoutItsLastSeparator) {
+    const std::string key = "28-[SEQUENCE]: /s/Snowfall.las / [CHANNEL]: Star / ";
+    for (const std::string& given :
+         {std::string("28-[SEQUENCE]: /s/Snowfall.las / [CHANNEL]: Star"),
+          std::string("28-[SEQUENCE]: /s/Snowfall.las / [CHANNEL]: Star /"), key}) {
+        const Outcome outcome = Run({"ignore", "--key", given});
+        EXPECT_EQ(outcome.status, 0) << given;
+        EXPECT_EQ(outcome.err, "") << given;
+    }
+    EXPECT_EQ(Run({"ignored"}).out,
+              "Ignored message numbers:\n    (none)\nIgnored results:\n    \"" + key + "\"\n");
+    const Outcome outcome = Run({"unignore", "--key",
+                                 "28-[SEQUENCE]: /s/Snowfall.las / "
+                                 "[CHANNEL]: Star"});
+    EXPECT_EQ(outcome.out, "The result \"" + key + "\" is no longer ignored.\n");
+    // A key without details stays as it is.
+    EXPECT_EQ(Run({"ignore", "--key", "20-"}).out, "The result \"20-\" will be ignored.\n");
+}
+
+// Paths in another code page give keys that are not UTF-8: they are shown, listed and taken
+// back in the escaped form, and the store keeps their bytes.
+TEST_F(IgnoreCommandsTest, AKeyOfAnyBytesIsShownAndTakenInItsEscapedForm) {
+    const std::string key = "21-C:\\Shows\\Caf\xE9.lss / ";
+    const std::string text = "escaped:21-C:\\\\Shows\\\\Caf\\xE9.lss / ";
+    Outcome outcome = Run({"ignore", "--key", text});
+    EXPECT_EQ(outcome.status, 0);
+    EXPECT_EQ(outcome.out, "The result \"" + text + "\" will be ignored.\n");
+    LibVerify::IgnoredResultKeys().Clear();
+    EXPECT_EQ(Run({"ignored"}).out,
+              "Ignored message numbers:\n    (none)\nIgnored results:\n    \"" + text + "\"\n");
+    EXPECT_EQ(nlohmann::json::parse(Run({"ignored", "--format", "json"}).out)["results"],
+              (nlohmann::json{text}));
+    EXPECT_TRUE(LibVerify::IgnoredResultKeys().Contains(key));
+
+    // The key's own bytes, as a shell on Linux passes them, name the same result.
+    outcome = Run({"ignore", "--key", key});
+    EXPECT_EQ(outcome.out, "The result \"" + text + "\" is already ignored.\n");
+    outcome = Run({"unignore", "--key", "escaped:21-C:\\\\Shows\\\\Caf\\xe9.lss"});
+    EXPECT_EQ(outcome.out, "The result \"" + text + "\" is no longer ignored.\n");
+
+    outcome = Run({"ignore", "--key", "escaped:21-C:\\Shows"});
+    EXPECT_EQ(outcome.status, 64);
+    EXPECT_EQ(outcome.err,
+              "vantori-verify: \"escaped:21-C:\\Shows\" is not a result's key: after "
+              "\"escaped:\", a backslash begins \"\\\\\" (one backslash) or \"\\x\" and two "
+              "hexadecimal digits (one byte)\n");
 }
 
 TEST_F(IgnoreCommandsTest, AStoreThatCannotBeWrittenIsReportedAndLeftAsItWas) {

@@ -47,7 +47,7 @@ std::vector<std::string> Findings(const nlohmann::json& document) {
 
 class VerifyDemoTest : public DemoTest {};
 
-TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
+TEST_F(VerifyDemoTest, TheScheduleListsErrorsFirstThenIgnoredOnesAndExitsTwo) {
     const Outcome outcome = Run({"--schedule"});
     EXPECT_EQ(outcome.status, 2);
     EXPECT_EQ(outcome.err, "");
@@ -60,6 +60,20 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "\n"
                   "    [EXPECTED]: 1.0.0.0\n"
                   "    [FOUND]: 0.9.4.2\n"
+                  "Error 23: Sequence file does not exist\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Fireworks.las\n"
+                  "    [SHOW]: show " +
+                  shows +
+                  "Weekend.lss\n"
+                  "Error 26: Media file does not exist\n"
+                  "    [FILE]: " +
+                  MediaFile("Jingle.mp3") +
+                  "\n"
+                  "    [SEQUENCE]: " +
+                  sequences +
+                  "Jingle.lms\n"
                   "Warning 33: Musical file used in non-audio section of show\n"
                   "    [SEQUENCE]: " +
                   sequences +
@@ -68,13 +82,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   shows +
                   "Weekend.lss\n"
                   "    [SECTION]: background\n"
-                  "Error 23: Sequence file does not exist\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Fireworks.las\n"
-                  "    [SHOW]: show " +
-                  shows +
-                  "Weekend.lss\n"
                   "Warning 43: Channel conflict\n"
                   "    [SHOW]: " +
                   shows +
@@ -103,13 +110,6 @@ TEST_F(VerifyDemoTest, TheScheduleListsFindingsThenIgnoredOnesAndExitsTwo) {
                   "Goodnight.las\n"
                   "    [TRACK]: Track 1: Drive\n"
                   "    [CHANNEL]: Driveway\n"
-                  "Error 26: Media file does not exist\n"
-                  "    [FILE]: " +
-                  MediaFile("Jingle.mp3") +
-                  "\n"
-                  "    [SEQUENCE]: " +
-                  sequences +
-                  "Jingle.lms\n"
                   "\n"
                   "Ignored results:\n"
                   "Warning 6: Verifier not running from VTR application path\n"
@@ -319,18 +319,78 @@ TEST_F(VerifyDemoTest, ATargetThatCannotBeSetUpExitsThreeWithTheReason) {
     EXPECT_EQ(outcome.status, 3);
     EXPECT_THAT(outcome.err, HasSubstr("it is a folder"));
 
-    // The report never overwrites the target, the schedules or the store.
+    // The report never overwrites the target, the schedules or the store, which is known
+    // before the run: nothing runs.
     const auto before = Snapshot();
     for (const std::vector<std::string>& arguments :
          {std::vector<std::string>{"--show", Demo("data/shows/Evening.lss"), "--output",
                                    Demo("data/shows/Evening.lss")},
+          std::vector<std::string>{"--sequence", Demo("data/sequences/Intro.las"), "--output",
+                                   Demo("data/shows/../sequences/Intro.las")},
           std::vector<std::string>{"--schedule", "--output", Demo("userdata/weeksched.lsc")},
           std::vector<std::string>{"--schedule", "--output", Demo("registry.reg")}}) {
         outcome = Run(arguments);
         EXPECT_EQ(outcome.status, 3);
-        EXPECT_THAT(outcome.err, HasSubstr("would overwrite a file of the suite"));
+        EXPECT_EQ(outcome.out, "");
+        EXPECT_EQ(outcome.err, "vantori-verify: Cannot save the results file as " +
+                                   arguments.back() +
+                                   ": this verification read that file; the verifier never "
+                                   "changes the files it verifies. Choose another file.\n");
+        EXPECT_THAT(TempFiles(), IsEmpty());
     }
     EXPECT_EQ(Snapshot(), before);
+}
+
+TEST_F(VerifyDemoTest, TheReportNeverReplacesAFileTheRunReadOrCheckedWhateverNamesIt) {
+    std::vector<std::pair<std::string, std::string>> cases = {
+        // What --output names, and the file of the suite that is.
+        {Demo("data/shows/Weekend.lss"), Demo("data/shows/Weekend.lss")},
+        {Demo("data/sequences/Snowfall.las"), Demo("data/sequences/Snowfall.las")},
+        {Demo("data/sequences/Sparkle.las"), Demo("data/sequences/Sparkle.las")},  // subsequence
+        {Demo("data/sequences/Bells.vtredit"), Demo("data/sequences/Bells.vtredit")},
+        {Demo("userdata/shellcmd.map"), Demo("userdata/shellcmd.map")},
+        {MediaFile("Carol.mp3"), MediaFile("Carol.mp3")},
+        {AppFile("SuiteTray.exe"), AppFile("SuiteTray.exe")},
+        // A media file that does not exist: the report would stand in for it.
+        {MediaFile("Jingle.mp3"), MediaFile("Jingle.mp3")},
+    };
+#ifndef _WIN32
+    fs::create_symlink(Demo("data/sequences/Goodnight.las"), folder_.File("link.txt"));
+    cases.push_back({folder_.File("link.txt"), Demo("data/sequences/Goodnight.las")});
+    fs::create_hard_link(Demo("data/sequences/Intro.las"), folder_.File("hard.txt"));
+    cases.push_back({folder_.File("hard.txt"), Demo("data/sequences/Intro.las")});
+    fs::create_symlink(MediaFile("Jingle.mp3"), folder_.File("dangling.txt"));
+    cases.push_back({folder_.File("dangling.txt"), MediaFile("Jingle.mp3")});
+    // The JSON report is refused alike.
+    fs::create_symlink(Demo("data/sequences/Carol.lms"), folder_.File("link.json"));
+    cases.push_back({folder_.File("link.json"), Demo("data/sequences/Carol.lms")});
+#endif
+    const auto before = Snapshot();
+    for (const auto& [output, file] : cases) {
+        const Outcome outcome = Run({"--schedule", "--output", output});
+        EXPECT_EQ(outcome.status, 3) << output;
+        // The run itself went through; only the report was refused.
+        EXPECT_THAT(outcome.out, StartsWith("Error 16: ")) << output;
+        const std::string why = output == file ? "this verification "
+                                               : "that is " + file + ", which this verification ";
+        EXPECT_THAT(outcome.err, StartsWith("vantori-verify: Cannot save the results file as " +
+                                            output + ": " + why))
+            << output;
+        EXPECT_THAT(outcome.err, EndsWith("; the verifier never changes the files it verifies. "
+                                          "Choose another file.\n"));
+    }
+    // So is a baseline.
+    const Outcome baseline = Run({"--schedule", "--write-baseline", Demo("userdata/shellcmd.map")});
+    EXPECT_EQ(baseline.status, 3);
+    EXPECT_EQ(baseline.err, "vantori-verify: Cannot save the baseline as " +
+                                Demo("userdata/shellcmd.map") +
+                                ": this verification checked that file; the verifier never "
+                                "changes the files it verifies. Choose another file.\n");
+    EXPECT_EQ(Snapshot(), before);
+#ifndef _WIN32
+    EXPECT_TRUE(fs::is_symlink(folder_.File("dangling.txt")));
+    EXPECT_FALSE(fs::exists(MediaFile("Jingle.mp3")));
+#endif
 }
 
 TEST_F(VerifyDemoTest, TheReportIsSavedAndTheLogWrittenAsTheWindowWritesIt) {
@@ -403,9 +463,22 @@ TEST_F(VerifyDemoTest, CtrlCDuringARunCancelsItCleanly) {
     EXPECT_EQ(document["checksPerformed"], 10);
     EXPECT_LT(document["checksPerformed"], full["checksPerformed"]);
     EXPECT_THAT(Findings(document), ::testing::Contains("W2"));
-    EXPECT_GE(outcome.status, 1);
+    EXPECT_EQ(outcome.status, 130);
+    EXPECT_EQ(outcome.err,
+              "vantori-verify: Ctrl-C: cancelling. The check that is running finishes first; "
+              "press Ctrl-C again to stop at once.\n");
     EXPECT_THAT(TempFiles(), IsEmpty());
     EXPECT_THAT(interrupter.Lines("ChecksCompleted "), ElementsAre("true"));
+
+    // Cancelled is cancelled, even when everything found, the cancellation included, is
+    // ignored and the run ends with "No errors or warnings found".
+    for (const char* number : {"2", "16", "43", "28", "26", "31"})
+        ASSERT_EQ(Run({"ignore", "--message", number}).status, 0);
+    checking = 0;
+    const Outcome quiet = Run({"--show", Demo("data/shows/Evening.lss")});
+    EXPECT_EQ(quiet.status, 130);
+    EXPECT_THAT(quiet.out, StartsWith("Info 1: No errors or warnings found\n"));
+    EXPECT_THAT(quiet.out, EndsWith(" Verification cancelled.\n"));
 
     // The handler is gone with the run: the next run is not cancelled.
     interrupter.onLine = nullptr;

@@ -8,6 +8,7 @@
 
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
+#include "environment/FilesRead.h"
 #include "environment/LibFile.h"
 #include "environment/NetworkPreferences.h"
 #include "schedule/Schedule.h"
@@ -310,6 +311,43 @@ TEST_F(DriverTest, TemporaryFilesAreGoneAfterACancelledRunAndAfterANewSelection)
     ASSERT_THAT(TempFiles(TempDir()), SizeIs(2));
     RunWith({MakeScripted("cancel", [] { LibVerify::CancelVerification(); })});
     EXPECT_THAT(TempFiles(TempDir()), IsEmpty());
+}
+
+TEST_F(DriverTest, TheTemporaryFilesAreWhereASignalHandlerCanRemoveThem) {
+    LibVerify::VerifySequenceFile("/shows/Carol.lms");
+    ASSERT_THAT(TempFiles(TempDir()), SizeIs(3));
+    // What a second Ctrl-C does, in its handler.
+    LibFile::RemoveRegisteredTempFiles();
+    EXPECT_THAT(TempFiles(TempDir()), IsEmpty());
+    // Once the run has deleted them, nothing of theirs is left to remove.
+    LibVerify::VerifyShowFile("/shows/a.lss");
+    LibVerify::DeleteTempFiles();
+    testsupport::WriteFileBytes(TempDir() + "/kept.txt", "");
+    LibFile::RemoveRegisteredTempFiles();
+    EXPECT_THAT(TempFiles(TempDir()), ElementsAre("kept.txt"));
+}
+
+TEST_F(DriverTest, TheFilesOfTheTargetAndThoseTheRunReadAreRecorded) {
+    const std::string show = folder_.File("a.lss");
+    const std::string other = folder_.File("b.lss");
+    for (const std::string& file : {show, other})
+        testsupport::WriteFileBytes(file, "");
+    LibVerify::VerifyShowFile(show);
+    // The target counts from its selection on; the run's own temporary files never do.
+    ASSERT_TRUE(FilesRead::FileNamedBy(show));
+    RunWith({MakeScripted("read", [&] { LibVerify::LoadShow(other); })});
+    ASSERT_TRUE(FilesRead::FileNamedBy(other));
+    EXPECT_EQ(FilesRead::FileNamedBy(other)->use, FilesRead::Use::Read);
+    for (const std::string& file :
+         {LibVerify::VerifiedWeeklyScheduleFile(), LibVerify::VerifiedYearlyScheduleFile()}) {
+        testsupport::WriteFileBytes(file, "");
+        EXPECT_FALSE(FilesRead::FileNamedBy(file)) << file;
+        fs::remove(file);
+    }
+    // The next run starts afresh, still with the same target.
+    RunWith({});
+    EXPECT_FALSE(FilesRead::FileNamedBy(other));
+    EXPECT_TRUE(FilesRead::FileNamedBy(show));
 }
 
 TEST_F(DriverTest, ATemporaryFileThatCannotBeMadeRaisesError37AndLeavesNothing) {

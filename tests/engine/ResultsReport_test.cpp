@@ -2,13 +2,19 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
+#include "environment/FilesRead.h"
 #include "environment/LibRegistryVTRShared.h"
+#include "support/Raised.h"
 #include "support/TempStore.h"
 
 namespace vtr {
 namespace {
+
+namespace fs = std::filesystem;
 
 class ResultsReportTest : public testsupport::StoreTest {
   protected:
@@ -95,6 +101,33 @@ TEST_F(ResultsReportTest, AFailureRaisesItsErrorAndLeavesNothingOpen) {
                   "Cannot write the results file /dev/full: No space left on device");
     }
 #endif
+}
+
+TEST_F(ResultsReportTest, AFileTheRunReadIsNeverReplacedAndAFailedSaveKeepsTheOldReport) {
+    LibVerify::AddResult(Severity::Warning, "x", 5, 5);
+    // What the window's Save gets when the user picks a file the run read: the error, shown
+    // under "Error Saving Verifier Messages", and the file as it was.
+    const std::string sequence = folder_.File("Snowfall.las");
+    testsupport::WriteFileBytes(sequence, "<sequence/>");
+    FilesRead::SetTargetFiles({});
+    FilesRead::Record(sequence, FilesRead::Use::Read);
+    const auto refused = testsupport::Raised([&] { ResultsReport::SaveResultsReport(sequence); });
+    ASSERT_TRUE(refused);
+    EXPECT_EQ(refused->Number(), 37);
+    EXPECT_EQ(refused->Source(), "ResultsReport.SaveResultsReport");
+    EXPECT_EQ(refused->Description(),
+              "Cannot save the results file as " + sequence +
+                  ": this verification read that file; the verifier never changes the files it "
+                  "verifies. Choose another file.");
+    EXPECT_EQ(testsupport::ReadFileBytes(sequence), "<sequence/>");
+    FilesRead::BeginRun();
+
+    // A report that cannot be replaced stays as it was.
+    const std::string report = folder_.File("report.txt");
+    testsupport::WriteFileBytes(report, "the last report");
+    fs::permissions(report, fs::perms::owner_read);
+    EXPECT_EQ(testsupport::RaisedNumber([&] { ResultsReport::SaveResultsReport(report); }), 75);
+    EXPECT_EQ(testsupport::ReadFileBytes(report), "the last report");
 }
 
 TEST_F(ResultsReportTest, TheSaveDialogStartsInTheUserDataFolder) {

@@ -2,6 +2,8 @@
 // folder with its own settings store, window settings file, temporary folder and clock.
 #include <QAbstractButton>
 #include <QApplication>
+#include <QClipboard>
+#include <QComboBox>
 #include <QGroupBox>
 #include <QHeaderView>
 #include <QLabel>
@@ -9,13 +11,18 @@
 #include <QMenu>
 #include <QMimeData>
 #include <QPlainTextEdit>
+#include <QProcess>
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
+#include <QScopeGuard>
+#include <QSettings>
 #include <QSignalSpy>
 #include <QTabWidget>
 #include <QTextBlock>
-#include <QTreeWidget>
+#include <QTextBrowser>
+#include <QToolButton>
+#include <QTreeView>
 #include <QtTest>
 #include <filesystem>
 #include <fstream>
@@ -25,6 +32,7 @@
 #include "ChmWriter.h"
 #include "HelpViewer.h"
 #include "UiTestMain.h"
+#include "VtrVersion.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
@@ -54,6 +62,8 @@ class RecordingPresenter : public vtr::DialogPresenter {
     };
     QList<Box> boxes;
     QList<FileDialogRequest> requests;
+    QStringList foldersOpened;
+    bool folderOpens = true;
     std::function<std::optional<QString>(const FileDialogRequest&)> answer;
 
     void ShowError(QWidget*, const QString& title, const QString& text) override {
@@ -62,6 +72,10 @@ class RecordingPresenter : public vtr::DialogPresenter {
     std::optional<QString> ChooseFile(QWidget*, const FileDialogRequest& request) override {
         requests.append(request);
         return answer ? answer(request) : std::nullopt;
+    }
+    bool OpenFolder(QWidget*, const QString& folder) override {
+        foldersOpened.append(folder);
+        return folderOpens;
     }
 };
 
@@ -100,31 +114,76 @@ vtr::DateTime FixedNow() {
 }
 const QString kStamp = QStringLiteral("3:07:09 PM: ");
 
-QStringList ListTexts(const QTreeWidget* list, int column = frmVerifier::DescriptionColumn) {
+QStringList ListTexts(const QTreeView* list, int column = frmVerifier::DescriptionColumn) {
     QStringList texts;
-    for (int i = 0; i < list->topLevelItemCount(); ++i)
-        texts.append(list->topLevelItem(i)->text(column));
+    const QAbstractItemModel* model = list->model();
+    for (int i = 0; i < model->rowCount(); ++i)
+        texts.append(model->index(i, column).data().toString());
     return texts;
 }
 
-QTreeWidgetItem* ItemOf(const QTreeWidget* list, const ResultPtr& result) {
-    for (int i = 0; i < list->topLevelItemCount(); ++i) {
-        if (frmVerifier::ResultOf(list->topLevelItem(i)) == result)
-            return list->topLevelItem(i);
-    }
-    return nullptr;
+int RowCount(const QTreeView* list) {
+    return list->model()->rowCount();
 }
 
-// A point on an item's description, in the list's viewport.
-QPoint OnItem(const QTreeWidget* list, QTreeWidgetItem* item) {
-    const QRect rect = list->visualItemRect(item);
+QModelIndex Row(const QTreeView* list, int row) {
+    return list->model()->index(row, 0);
+}
+
+QString Text(const QModelIndex& row, int column) {
+    return row.siblingAtColumn(column).data().toString();
+}
+
+qint64 IconKey(const QModelIndex& row) {
+    return row.data(Qt::DecorationRole).value<QIcon>().cacheKey();
+}
+
+// The row of a result, at the top or inside a group.
+QModelIndex ItemOf(const QTreeView* list, const ResultPtr& result) {
+    const QAbstractItemModel* model = list->model();
+    for (int i = 0; i < model->rowCount(); ++i) {
+        const QModelIndex row = model->index(i, 0);
+        if (frmVerifier::ResultOf(row) == result)
+            return row;
+        for (int j = 0; j < model->rowCount(row); ++j) {
+            if (frmVerifier::ResultOf(model->index(j, 0, row)) == result)
+                return model->index(j, 0, row);
+        }
+    }
+    return {};
+}
+
+// A point on a row's description, in the list's viewport.
+QPoint OnItem(const QTreeView* list, const QModelIndex& row) {
+    const QRect rect = list->visualRect(row);
     return QPoint(rect.left() + 20, rect.center().y());
+}
+
+// A right click on an item through the window system, as a user's: the press reaches the
+// window, which opens the context menu at the pointer.
+QPoint RightClick(QTreeView* list, const QModelIndex& row) {
+    const QPoint at = OnItem(list, row);
+    QWidget* window = list->window();
+    QTest::mouseClick(window->windowHandle(), Qt::RightButton, {},
+                      list->viewport()->mapTo(window, at));
+    return list->viewport()->mapToGlobal(at);
+}
+
+// A click on a menu's entry, where it is shown.
+void ClickMenuEntry(QMenu* menu, const QString& text) {
+    for (QAction* action : menu->actions()) {
+        if (action->text() == text) {
+            QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(action).center());
+            return;
+        }
+    }
+    QFAIL(qPrintable(QStringLiteral("no menu entry ") + text));
 }
 
 // A double-click on an item, as the system delivers it: press, release, then the double
 // click itself.
-void DoubleClick(QTreeWidget* list, QTreeWidgetItem* item) {
-    const QPointF at = OnItem(list, item);
+void DoubleClick(QTreeView* list, const QModelIndex& row) {
+    const QPointF at = OnItem(list, row);
     const QPointF global = list->viewport()->mapToGlobal(at);
     for (QEvent::Type type : {QEvent::MouseButtonPress, QEvent::MouseButtonRelease,
                               QEvent::MouseButtonDblClick, QEvent::MouseButtonRelease}) {
@@ -162,6 +221,19 @@ class FrmVerifierTest : public QObject {
     void placementAndTargetAreRemembered();
     void aDroppedFileBecomesTheTarget();
     void keyboardReachesTheCommands();
+    void popupActsOnTheRowUnderThePointer();
+    void countersFollowIgnoring();
+    void relativeTargetsBecomeAbsolute();
+    void aCancelledRunSaysSo();
+    void versionAndHelpNeedNoDisplay();
+    void logColoursSuitThePalette();
+    void stopIgnoringFromTheIgnoredList();
+    void detailsPaneShowsTheSelectedResultWhole();
+    void filterFindsTextAndSeverities();
+    void errorsFirstAndBackToTheOrderFound();
+    void groupsCarryTheirCounts();
+    void groupingFollowsARun();
+    void detailColumnsShowFileNames();
 
   private:
     template <typename T>
@@ -171,8 +243,8 @@ class FrmVerifierTest : public QObject {
             qFatal("no control %s", name);
         return found;
     }
-    QTreeWidget* Results() const { return Find<QTreeWidget>("lvResults1"); }
-    QTreeWidget* Ignored() const { return Find<QTreeWidget>("lvResults2"); }
+    QTreeView* Results() const { return Find<QTreeView>("lvResults1"); }
+    QTreeView* Ignored() const { return Find<QTreeView>("lvResults2"); }
     QStringList LogLines() const;
     QColor LogLineColour(int fromEnd) const;
     void Click(const char* button) const {
@@ -184,6 +256,15 @@ class FrmVerifierTest : public QObject {
     std::string AppFolder() const { return folder_->File("app"); }
     std::string DataFolder() const { return folder_->File("data"); }
     std::vector<std::string> TemporaryFiles() const;
+    // Seven results of one show: conflicts between sequences and inside one, a missing
+    // sequence and show, information.
+    struct Mix {
+        ResultPtr conflict, missingSequence, conflictBack, noMedia, inside, intensity, missingShow;
+    };
+    Mix AddMix();
+    void ChooseGroupBy(const QString& grouping);
+    QString Shown() const { return Find<QLabel>("lblShown")->text(); }
+    void Filter(const QString& text);
 
     std::unique_ptr<vtr::testsupport::TempFolder> folder_;
     std::unique_ptr<vtr::testsupport::ScopedStore> store_;
@@ -305,11 +386,11 @@ void FrmVerifierTest::loadsWithEveryControlAndBegins() {
                         QStringLiteral("Msg Num")};
     for (int i = 1; i <= 9; ++i)
         columns.append(QStringLiteral("Details%1").arg(i));
-    for (QTreeWidget* list : {Results(), Ignored()}) {
-        QCOMPARE(list->columnCount(), 12);
+    for (QTreeView* list : {Results(), Ignored()}) {
+        QCOMPARE(list->model()->columnCount(), 12);
         QStringList headers;
-        for (int i = 0; i < list->columnCount(); ++i)
-            headers.append(list->headerItem()->text(i));
+        for (int i = 0; i < list->model()->columnCount(); ++i)
+            headers.append(list->model()->headerData(i, Qt::Horizontal).toString());
         QCOMPARE(headers, columns);
     }
     auto* images = window_->findChild<vtr::SeverityImageList*>(QStringLiteral("imlSeverity"));
@@ -331,12 +412,15 @@ void FrmVerifierTest::loadsWithEveryControlAndBegins() {
     QCOMPARE(Find<QPushButton>("cmdCancel")->text(), QStringLiteral("&Cancel"));
     QCOMPARE(Find<QPushButton>("cmdVerify")->text(), QStringLiteral("&Verify"));
 
+    // The pop-up menu's entries, the result's own first; then Copy.
     const QList<QAction*> popup = Find<QMenu>("mnuResultPopup")->actions();
-    QCOMPARE(popup.size(), 4);
+    QCOMPARE(popup.size(), 6);
     QCOMPARE(popup[0]->text(), QStringLiteral("Help on this result"));
     QVERIFY(popup[1]->isSeparator());
     QCOMPARE(popup[2]->text(), QStringLiteral("Ignore this result"));
     QCOMPARE(popup[3]->text(), QStringLiteral("Ignore all results with this message number"));
+    QVERIFY(popup[4]->isSeparator());
+    QCOMPARE(popup[5]->text(), QStringLiteral("Copy"));
     ExpectIdle();
 
     // Loaded: registered with the driver, and BeginVerification ran once, queueing the three
@@ -386,11 +470,10 @@ void FrmVerifierTest::runFillsTheListsAndCounters() {
                                 QString::fromStdString(show)));
 
     // Lists and counters agree with the driver's collections.
-    QCOMPARE(Results()->topLevelItemCount(), int(LibVerify::GetResults().size()));
-    QCOMPARE(Ignored()->topLevelItemCount(), 0);
+    QCOMPARE(RowCount(Results()), int(LibVerify::GetResults().size()));
+    QCOMPARE(RowCount(Ignored()), 0);
     for (std::size_t i = 0; i < LibVerify::GetResults().size(); ++i)
-        QCOMPARE(frmVerifier::ResultOf(Results()->topLevelItem(int(i))),
-                 LibVerify::GetResults()[i]);
+        QCOMPARE(frmVerifier::ResultOf(Row(Results(), int(i))), LibVerify::GetResults()[i]);
     QVERIFY(ListTexts(Results()).contains(QStringLiteral("Show file does not exist")));
     QVERIFY(ListTexts(Results()).contains(QStringLiteral("Application file does not exist")));
     QVERIFY(LibVerify::ErrorCount() > 1);
@@ -424,9 +507,9 @@ void FrmVerifierTest::runOnTheDemoInstallation() {
     Click("cmdVerify");  // the entire schedule
     ExpectIdle();
     QCOMPARE(LogLines().constLast(), kStamp + QStringLiteral("Verification completed"));
-    QVERIFY(Results()->topLevelItemCount() > 0);
-    QCOMPARE(Results()->topLevelItemCount(), int(LibVerify::GetResults().size()));
-    QCOMPARE(Ignored()->topLevelItemCount(), int(LibVerify::GetIgnoredResults().size()));
+    QVERIFY(RowCount(Results()) > 0);
+    QCOMPARE(RowCount(Results()), int(LibVerify::GetResults().size()));
+    QCOMPARE(RowCount(Ignored()), int(LibVerify::GetIgnoredResults().size()));
     QVERIFY(LibVerify::ChecksPerformedCount() > 20);
     QCOMPARE(Find<QLabel>("lblChecksPerformedCount")->text(),
              QString::number(LibVerify::ChecksPerformedCount()));
@@ -435,8 +518,8 @@ void FrmVerifierTest::runOnTheDemoInstallation() {
     QVERIFY(LibVerify::ErrorCount() + LibVerify::WarningCount() > 0);
 #ifndef _WIN32
     // Help on a result opens its page of the demo's help file, found by its help-context id.
-    const ResultPtr first = frmVerifier::ResultOf(Results()->topLevelItem(0));
-    Results()->setCurrentItem(Results()->topLevelItem(0));
+    const ResultPtr first = frmVerifier::ResultOf(Row(Results(), 0));
+    Results()->setCurrentIndex(Row(Results(), 0));
     Click("cmdHelp");
     auto* viewer = window_->findChild<vtr::HelpViewer*>(QStringLiteral("HelpViewer"));
     QVERIFY(viewer != nullptr);
@@ -539,13 +622,13 @@ void FrmVerifierTest::resultsAreListedAndLoggedInTheirColours() {
     // Earlier lines keep their colours.
     QCOMPARE(LogLineColour(3), QColor(255, 128, 0));
 
-    QTreeWidget* list = Results();
-    QCOMPARE(list->topLevelItemCount(), 4);
-    QTreeWidgetItem* item = list->topLevelItem(0);
+    QTreeView* list = Results();
+    QCOMPARE(RowCount(list), 4);
+    const QModelIndex item = Row(list, 0);
     QCOMPARE(frmVerifier::ResultOf(item), warning);
     QStringList texts;
     for (int column = 0; column < 12; ++column)
-        texts.append(item->text(column));
+        texts.append(Text(item, column));
     QCOMPARE(texts, (QStringList{QStringLiteral("Channel conflict"),
                                  QStringLiteral("Warning"),
                                  QStringLiteral("43"),
@@ -559,18 +642,16 @@ void FrmVerifierTest::resultsAreListedAndLoggedInTheirColours() {
                                  {},
                                  {}}));
     auto* images = window_->findChild<vtr::SeverityImageList*>(QStringLiteral("imlSeverity"));
-    QCOMPARE(item->icon(0).cacheKey(), images->Image(QStringLiteral("Warning")).cacheKey());
-    QCOMPARE(list->topLevelItem(1)->icon(0).cacheKey(),
-             images->Image(QStringLiteral("Info")).cacheKey());
-    QCOMPARE(list->topLevelItem(2)->icon(0).cacheKey(),
-             images->Image(QStringLiteral("Error")).cacheKey());
-    QCOMPARE(list->topLevelItem(2)->text(3), QStringLiteral("x.lss"));
-    QTreeWidgetItem* oddItem = list->topLevelItem(3);
+    QCOMPARE(IconKey(item), images->Image(QStringLiteral("Warning")).cacheKey());
+    QCOMPARE(IconKey(Row(list, 1)), images->Image(QStringLiteral("Info")).cacheKey());
+    QCOMPARE(IconKey(Row(list, 2)), images->Image(QStringLiteral("Error")).cacheKey());
+    QCOMPARE(Text(Row(list, 2), 3), QStringLiteral("x.lss"));
+    const QModelIndex oddItem = Row(list, 3);
     QCOMPARE(frmVerifier::ResultOf(oddItem), odd);
-    QCOMPARE(oddItem->text(1), QStringLiteral("Severity 7"));
-    QCOMPARE(oddItem->text(2), QStringLiteral("98"));
-    QCOMPARE(oddItem->text(11), QStringLiteral("9"));
-    QVERIFY(oddItem->icon(0).isNull());
+    QCOMPARE(Text(oddItem, 1), QStringLiteral("Severity 7"));
+    QCOMPARE(Text(oddItem, 2), QStringLiteral("98"));
+    QCOMPARE(Text(oddItem, 11), QStringLiteral("9"));
+    QVERIFY(oddItem.data(Qt::DecorationRole).value<QIcon>().isNull());
     // The counters follow the results as they come.
     QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("1"));
     QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("1"));
@@ -582,9 +663,9 @@ void FrmVerifierTest::ignoredResultsAreListedApartAndStillLogged() {
     vtr::IgnoreLists::IgnoreMessageNumber(23);
     const ResultPtr ignored =
         LibVerify::AddResult(Severity::Error, "Sequence file does not exist", 23, 23, {"a.lms"});
-    QCOMPARE(Results()->topLevelItemCount(), 0);
-    QCOMPARE(Ignored()->topLevelItemCount(), 1);
-    QCOMPARE(frmVerifier::ResultOf(Ignored()->topLevelItem(0)), ignored);
+    QCOMPARE(RowCount(Results()), 0);
+    QCOMPARE(RowCount(Ignored()), 1);
+    QCOMPARE(frmVerifier::ResultOf(Row(Ignored(), 0)), ignored);
     QCOMPARE(LogLines().constLast(),
              kStamp + QStringLiteral("Sequence file does not exist: a.lms"));
     QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
@@ -596,16 +677,16 @@ void FrmVerifierTest::ignoringMovesTheListedResults() {
     const ResultPtr b = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
     const ResultPtr c = LibVerify::AddResult(Severity::Error, "Six C", 6, 6, {"C"});
     const ResultPtr d = LibVerify::AddResult(Severity::Warning, "Five D", 5, 5, {"D"});
-    QTreeWidget* results = Results();
-    QTreeWidget* ignored = Ignored();
+    QTreeView* results = Results();
+    QTreeView* ignored = Ignored();
     auto* menu = Find<QMenu>("mnuResultPopup");
 
     // Right click on B, "Ignore this result": B moves at once.
-    const QPoint onB = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, b)));
-    emit results->customContextMenuRequested(onB);
-    QVERIFY(menu->isVisible());
-    menu->actions()[2]->trigger();
-    menu->hide();
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    RightClick(results, ItemOf(results, b));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore this result"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Six C"),
                                               QStringLiteral("Five D")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B")}));
@@ -614,10 +695,10 @@ void FrmVerifierTest::ignoringMovesTheListedResults() {
 
     // "Ignore all results with this message number" on A: the other fives follow, and the
     // ignored list keeps the order in which the results were produced.
-    const QPoint onA = results->viewport()->mapTo(results, OnItem(results, ItemOf(results, a)));
-    emit results->customContextMenuRequested(onA);
-    menu->actions()[3]->trigger();
-    menu->hide();
+    RightClick(results, ItemOf(results, a));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore all results with this message number"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Six C")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
                                               QStringLiteral("Five D")}));
@@ -634,7 +715,7 @@ void FrmVerifierTest::ignoringMovesTheListedResults() {
     // The keyboard: Delete ignores the selected result.
     Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
     results->setFocus();
-    results->setCurrentItem(ItemOf(results, c));
+    results->setCurrentIndex(ItemOf(results, c));
     QTest::keyClick(results, Qt::Key_Delete);
     QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five D")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B"), QStringLiteral("Six C")}));
@@ -646,7 +727,7 @@ void FrmVerifierTest::resultListsSortByValue() {
     LibVerify::AddResult(Severity::Info, "two", 2, 2);
     LibVerify::AddResult(Severity::Warning, "ten second", 10, 10);
     LibVerify::AddResult(Severity::Warning, "seven", 7, 7);
-    QTreeWidget* list = Results();
+    QTreeView* list = Results();
     Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
     // Until a header is clicked, the order produced.
     QCOMPARE(ListTexts(list), (QStringList{QStringLiteral("ten first"), QStringLiteral("two"),
@@ -654,7 +735,7 @@ void FrmVerifierTest::resultListsSortByValue() {
     // Message numbers by value (2 before 10), equal ones in the order produced.
     const int msgNumX = list->header()->sectionViewportPosition(frmVerifier::MsgNumColumn) + 5;
     QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
-    QCOMPARE(list->sortColumn(), int(frmVerifier::MsgNumColumn));
+    QCOMPARE(list->header()->sortIndicatorSection(), int(frmVerifier::MsgNumColumn));
     QCOMPARE(ListTexts(list),
              (QStringList{QStringLiteral("two"), QStringLiteral("seven"),
                           QStringLiteral("ten first"), QStringLiteral("ten second")}));
@@ -803,7 +884,7 @@ void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
         LibVerify::AddResult(Severity::Warning, "Trigger uses undefined network", 56, 53);
     auto* tabs = Find<QTabWidget>("sstDetails");
     tabs->setCurrentIndex(frmVerifier::ResultsTab);
-    Results()->setCurrentItem(ItemOf(Results(), conflict));
+    Results()->setCurrentIndex(ItemOf(Results(), conflict));
     Click("cmdHelp");
     QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
     // The ignored tab with nothing selected: the verifier's page again.
@@ -815,14 +896,14 @@ void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
     // does not map opens the verifier's page.
     tabs->setCurrentIndex(frmVerifier::ResultsTab);
     auto* menu = Find<QMenu>("mnuResultPopup");
-    emit Results()->customContextMenuRequested(
-        Results()->viewport()->mapTo(Results(), OnItem(Results(), ItemOf(Results(), conflict))));
-    menu->actions()[0]->trigger();
-    menu->hide();
+    RightClick(Results(), ItemOf(Results(), conflict));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Help on this result"));
+    QTRY_VERIFY(!menu->isVisible());
     QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
     window_->OpenResult(other);
     QCOMPARE(viewerPage(), QStringLiteral("/Verifier.htm"));
-    QTreeWidgetItem* item = ItemOf(Results(), conflict);
+    const QModelIndex item = ItemOf(Results(), conflict);
     DoubleClick(Results(), item);
     QCOMPARE(viewerPage(), QStringLiteral("/msg43.htm"));
     QVERIFY(dialogs_->boxes.isEmpty());
@@ -841,17 +922,21 @@ void FrmVerifierTest::helpOnResultsAndOnTheVerifier() {
 }
 
 void FrmVerifierTest::placementAndTargetAreRemembered() {
+    const QString show =
+        QDir::toNativeSeparators(QString::fromStdString(folder_->File("Main.lss")));
+    const QString sequence =
+        QDir::toNativeSeparators(QString::fromStdString(folder_->File("Carol.lms")));
     window_->resize(777, 555);
     Find<QRadioButton>("optTargetShow")->setChecked(true);
-    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("/shows/Main.lss"));
-    Find<QLineEdit>("txtTargetSequence")->setText(QStringLiteral("/seq/Carol.lms"));
+    Find<QLineEdit>("txtTargetShow")->setText(show);
+    Find<QLineEdit>("txtTargetSequence")->setText(sequence);
     QVERIFY(window_->close());
 
     window_ = MakeWindow();
     QCOMPARE(window_->size(), QSize(777, 555));
     QVERIFY(Find<QRadioButton>("optTargetShow")->isChecked());
-    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), QStringLiteral("/shows/Main.lss"));
-    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), QStringLiteral("/seq/Carol.lms"));
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), show);
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(), sequence);
     // Kept in the window's own file, never in the suite's settings store.
     QCOMPARE(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg")), storeText_);
 }
@@ -911,13 +996,753 @@ void FrmVerifierTest::keyboardReachesTheCommands() {
     LibVerify::AddResult(Severity::Warning, "Five", 5, 5);
     Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
     Results()->setFocus();
-    Results()->setCurrentItem(Results()->topLevelItem(0));
+    Results()->setCurrentIndex(Row(Results(), 0));
     QContextMenuEvent menuKey(QContextMenuEvent::Keyboard, QPoint(0, 0),
                               Results()->mapToGlobal(QPoint(0, 0)));
     QApplication::sendEvent(Results(), &menuKey);
     auto* menu = Find<QMenu>("mnuResultPopup");
     QTRY_VERIFY(menu->isVisible());
     menu->hide();
+}
+
+void FrmVerifierTest::popupActsOnTheRowUnderThePointer() {
+    const ResultPtr error =
+        LibVerify::AddResult(Severity::Error, "Show file does not exist", 21, 21, {"a.lss"});
+    const ResultPtr first = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr second = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    QTreeView* results = Results();
+    // The user had selected the error, then right-clicks the second warning.
+    QTest::mouseClick(results->viewport(), Qt::LeftButton, {},
+                      OnItem(results, ItemOf(results, error)));
+    QCOMPARE(results->currentIndex(), ItemOf(results, error));
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    const QPoint pointer = RightClick(results, ItemOf(results, second));
+    QTRY_VERIFY(menu->isVisible());
+    // The menu opens at the pointer, on the row under it, which becomes the selected one.
+    QCOMPARE(menu->pos(), pointer);
+    QCOMPARE(results->currentIndex(), ItemOf(results, second));
+    ClickMenuEntry(menu, QStringLiteral("Ignore this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(results),
+             (QStringList{QStringLiteral("Show file does not exist"), QStringLiteral("Five A")}));
+    QCOMPARE(ListTexts(Ignored()), (QStringList{QStringLiteral("Five B")}));
+    const std::string store = vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"));
+    QVERIFY(store.find("\"IgnoreMsg1\"=\"5-B / \"") != std::string::npos);
+    QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
+
+    // The same on the first row, right under the header.
+    RightClick(results, ItemOf(results, error));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore all results with this message number"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(results), (QStringList{QStringLiteral("Five A")}));
+    QVERIFY(vtr::testsupport::ReadFileBytes(folder_->File("registry.reg"))
+                .find("\"IgnoreMsgNum1\"=\"21\"") != std::string::npos);
+    Q_UNUSED(first);
+}
+
+void FrmVerifierTest::countersFollowIgnoring() {
+    const ResultPtr e1 = LibVerify::AddResult(Severity::Error, "Error one", 21, 21, {"1"});
+    const ResultPtr e2 = LibVerify::AddResult(Severity::Error, "Error two", 21, 21, {"2"});
+    const ResultPtr e3 = LibVerify::AddResult(Severity::Error, "Error three", 22, 22, {"3"});
+    const ResultPtr w1 = LibVerify::AddResult(Severity::Warning, "Warning one", 5, 5, {"4"});
+    const ResultPtr w2 = LibVerify::AddResult(Severity::Warning, "Warning two", 5, 5, {"5"});
+    LibVerify::AddResult(Severity::Info, "Info", 1, 1);
+    auto errors = [this] { return Find<QLabel>("lblErrorsCount")->text(); };
+    auto warnings = [this] { return Find<QLabel>("lblWarningsCount")->text(); };
+    QCOMPARE(errors(), QStringLiteral("3"));
+    QCOMPARE(warnings(), QStringLiteral("2"));
+
+    window_->IgnoreResult(e2);
+    QCOMPARE(errors(), QStringLiteral("2"));
+    QCOMPARE(warnings(), QStringLiteral("2"));
+    window_->IgnoreMessageNumber(w1);
+    QCOMPARE(errors(), QStringLiteral("2"));
+    QCOMPARE(warnings(), QStringLiteral("0"));
+    window_->IgnoreMessageNumber(e1);  // e2 is ignored twice over now
+    QCOMPARE(errors(), QStringLiteral("1"));
+
+    vtr::IgnoreLists::UnignoreMessageNumber(5);
+    window_->RefreshIgnoredResults();
+    QCOMPARE(warnings(), QStringLiteral("2"));
+    vtr::IgnoreLists::UnignoreMessageNumber(21);
+    window_->RefreshIgnoredResults();
+    QCOMPARE(errors(), QStringLiteral("2"));  // e1 back; e2 still ignored on its own
+    QCOMPARE(RowCount(Results()), 5);
+    Q_UNUSED(e3);
+    Q_UNUSED(w2);
+}
+
+void FrmVerifierTest::relativeTargetsBecomeAbsolute() {
+    // The working folder is the test's; the target is named relative to it.
+    const QString previous = QDir::currentPath();
+    QVERIFY(QDir::setCurrent(QString::fromStdString(folder_->Path())));
+    auto restore = qScopeGuard([&] { QDir::setCurrent(previous); });
+    fs::create_directories(folder_->File("shows"));
+    const QString absoluteShow = QDir::toNativeSeparators(
+        QString::fromStdString(folder_->File("shows")) + QStringLiteral("/Missing.lss"));
+
+    // Typed.
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("shows/../shows/Missing.lss"));
+    Click("cmdVerify");
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), absoluteShow);
+    QVERIFY(
+        LogLines().contains(kStamp + QStringLiteral("Show file does not exist: ") + absoluteShow));
+
+    // Given on the command line (or dropped).
+    QVERIFY(window_->SetTargetFile(QStringLiteral("Intro.las")));
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("Intro.las"))));
+
+    // Remembered: absolute, so that it holds wherever the window opens next.
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("Other.lss"));
+    QVERIFY(window_->close());
+    const QSettings settings(QString::fromStdString(folder_->File("window.ini")),
+                             QSettings::IniFormat);
+    QCOMPARE(settings.value(QStringLiteral("target/show")).toString(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("Other.lss"))));
+
+    // A relative one remembered by an older window is read against the working folder.
+    {
+        QSettings old(QString::fromStdString(folder_->File("window.ini")), QSettings::IniFormat);
+        old.setValue(QStringLiteral("target/sequence"), QStringLiteral("old/Carol.lms"));
+    }
+    window_ = MakeWindow();
+    QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(),
+             QDir::toNativeSeparators(QString::fromStdString(folder_->File("old")) +
+                                      QStringLiteral("/Carol.lms")));
+}
+
+void FrmVerifierTest::aCancelledRunSaysSo() {
+    Watcher watcher;
+    watcher.onCompleted = [&](int completed) {
+        if (completed == 2)
+            QMetaObject::invokeMethod(Find<QPushButton>("cmdCancel"), "click",
+                                      Qt::QueuedConnection);
+    };
+    Click("cmdVerify");
+    auto* progress = Find<QProgressBar>("prgVerification");
+    QCOMPARE(progress->text(), QStringLiteral("Cancelled"));
+    // The bar stops where the run did, short of the checks that were dropped.
+    QCOMPARE(progress->value(), 2);
+    QVERIFY(progress->maximum() > 2);
+    QVERIFY(Find<QLabel>("lblStatus")->text().startsWith(QStringLiteral("Cancelled")));
+
+    // The next run counts checks again.
+    watcher.onCompleted = nullptr;
+    Click("cmdVerify");
+    QCOMPARE(progress->text(), QStringLiteral("%1 of %1 checks").arg(progress->maximum()));
+    QVERIFY(!Find<QLabel>("lblStatus")->text().startsWith(QStringLiteral("Cancelled")));
+}
+
+void FrmVerifierTest::versionAndHelpNeedNoDisplay() {
+    // A platform that cannot be had: the answers must come before any window system is asked.
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("no-such-platform"));
+    environment.remove(QStringLiteral("DISPLAY"));
+    environment.remove(QStringLiteral("WAYLAND_DISPLAY"));
+    environment.insert(QStringLiteral("QT_COMMAND_LINE_PARSER_NO_GUI_MESSAGE_BOXES"),
+                       QStringLiteral("1"));
+    auto run = [&](const QString& argument) {
+        QProcess program;
+        program.setProcessEnvironment(environment);
+        program.start(QStringLiteral(VTR_VERIFIER_PROGRAM), {argument});
+        program.waitForFinished(30000);
+        return std::make_pair(
+            program.exitStatus() == QProcess::NormalExit ? program.exitCode() : -1,
+            QString::fromLocal8Bit(program.readAllStandardOutput()));
+    };
+    const auto [versionStatus, version] = run(QStringLiteral("--version"));
+    QCOMPARE(versionStatus, 0);
+    QCOMPARE(version.trimmed(),
+             QStringLiteral("vantori-verifier ") + QString::fromLatin1(vtr::kVersionText));
+    const auto [helpStatus, help] = run(QStringLiteral("--help"));
+    QCOMPARE(helpStatus, 0);
+    QVERIFY(help.contains(QStringLiteral("--registry <FILE>")));
+    QVERIFY(help.contains(QStringLiteral("[TARGET]")));
+}
+
+void FrmVerifierTest::logColoursSuitThePalette() {
+    auto* log = Find<QPlainTextEdit>("rtxOutputLog");
+    // On a light page: the severities' own colours, and black.
+    LibVerify::AddResult(Severity::Info, "Info", 1, 1);
+    QCOMPARE(LogLineColour(0), QColor(0, 0, 255));
+    LibVerify::AddResult(Severity::Warning, "Warning", 5, 5);
+    QCOMPARE(LogLineColour(0), QColor(255, 128, 0));
+    LibVerify::AddResult(Severity::Error, "Error", 21, 21);
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+
+    // A dark palette: every line stays readable against the page, the earlier ones included.
+    QPalette dark;
+    dark.setColor(QPalette::Base, QColor(30, 30, 30));
+    dark.setColor(QPalette::Text, QColor(220, 220, 220));
+    dark.setColor(QPalette::Window, QColor(45, 45, 45));
+    dark.setColor(QPalette::WindowText, QColor(220, 220, 220));
+    window_->setPalette(dark);
+    LibVerify::PostTransientMessage("Loading sequence: 40%");
+    const QColor page = log->palette().color(QPalette::Base);
+    QCOMPARE(page, QColor(30, 30, 30));
+    auto readable = [&](const QColor& colour) {
+        return colour.lightnessF() - page.lightnessF() > 0.4;
+    };
+    QVERIFY(readable(LogLineColour(0)));  // the plain line
+    const QColor info = LogLineColour(3);
+    const QColor warning = LogLineColour(2);
+    const QColor error = LogLineColour(1);
+    for (const QColor& colour : {info, warning, error})
+        QVERIFY2(readable(colour), qPrintable(colour.name()));
+    // Still the same hues: blue, orange, red.
+    QVERIFY(info.blue() > info.red() && info.blue() > info.green());
+    QVERIFY(warning.red() > warning.green() && warning.green() > warning.blue());
+    QVERIFY(error.red() > error.green() && error.green() == error.blue());
+    LibVerify::AddResult(Severity::Error, "Error", 21, 21);
+    QCOMPARE(LogLineColour(0), error);
+
+    // Back to light: the severities' own colours again.
+    window_->setPalette(QPalette(QColor(240, 240, 240)));
+    QCOMPARE(LogLineColour(0), QColor(255, 0, 0));
+    QCOMPARE(LogLineColour(4), QColor(0, 0, 255));
+}
+
+void FrmVerifierTest::stopIgnoringFromTheIgnoredList() {
+    const ResultPtr a = LibVerify::AddResult(Severity::Warning, "Five A", 5, 5, {"A"});
+    const ResultPtr b = LibVerify::AddResult(Severity::Warning, "Five B", 5, 5, {"B"});
+    const ResultPtr c = LibVerify::AddResult(Severity::Error, "Six C", 6, 6, {"C"});
+    const ResultPtr d = LibVerify::AddResult(Severity::Warning, "Seven D", 7, 7, {"D"});
+    window_->IgnoreResult(b);
+    window_->IgnoreMessageNumber(c);
+    window_->IgnoreResult(d);
+    window_->IgnoreMessageNumber(d);  // D is ignored twice over
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTreeView* ignored = Ignored();
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Five B"), QStringLiteral("Six C"),
+                                              QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("0"));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("1"));
+
+    // The ignored list's menu offers the way back, for what each result is ignored by.
+    auto* menu = Find<QMenu>("mnuIgnoredPopup");
+    QStringList entries;
+    for (QAction* action : menu->actions())
+        entries.append(action->text());
+    QCOMPARE(entries, (QStringList{QStringLiteral("Help on this result"), QString(),
+                                   QStringLiteral("Stop ignoring this result"),
+                                   QStringLiteral("Stop ignoring all results with this message "
+                                                  "number"),
+                                   QString(), QStringLiteral("Copy")}));
+    auto* byKey = Find<QAction>("mnuStopIgnoringResult");
+    auto* byNumber = Find<QAction>("mnuStopIgnoringMessageNumber");
+    RightClick(ignored, ItemOf(ignored, c));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(!Find<QMenu>("mnuResultPopup")->isVisible());
+    QVERIFY(!byKey->isEnabled());
+    QVERIFY(byNumber->isEnabled());
+    menu->hide();
+    RightClick(ignored, ItemOf(ignored, d));
+    QTRY_VERIFY(menu->isVisible());
+    QVERIFY(byKey->isEnabled() && byNumber->isEnabled());
+    menu->hide();
+
+    // B, ignored on its own: back in its place at once, and the store changed exactly as the
+    // command line's unignore changes it.
+    const std::string storeFile = folder_->File("registry.reg");
+    const std::string cliStore = folder_->File("cli.reg");
+    fs::copy_file(storeFile, cliStore);
+    RightClick(ignored, ItemOf(ignored, b));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Stop ignoring this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B")}));
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("2"));
+    QProcess cli;
+    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
+              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
+               QStringLiteral("unignore"), QStringLiteral("--key"), QStringLiteral("5-B / ")});
+    QVERIFY(cli.waitForFinished(30000));
+    QCOMPARE(cli.exitCode(), 0);
+    QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
+    const std::string store = vtr::testsupport::ReadFileBytes(storeFile);
+    QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
+    QVERIFY(store.find("\"IgnoreMsg1\"=\"7-D / \"") != std::string::npos);
+
+    // C, ignored by its message number: the keyboard's Shift+Delete.
+    ignored->setFocus();
+    ignored->setCurrentIndex(ItemOf(ignored, c));
+    QTest::keyClick(ignored, Qt::Key_Delete, Qt::ShiftModifier);
+    QCOMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                                                QStringLiteral("Six C")}));
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("1"));
+    QVERIFY(vtr::testsupport::ReadFileBytes(storeFile).find(
+                "\"CountIgnoreMsgNum\"=dword:00000001") != std::string::npos);
+
+    // D, ignored twice over, stays ignored until both entries are gone.
+    window_->StopIgnoringResult(d);
+    QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Seven D")}));
+    window_->StopIgnoringMessageNumber(d);
+    QVERIFY(ListTexts(ignored).isEmpty());
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B"),
+                          QStringLiteral("Six C"), QStringLiteral("Seven D")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("3"));
+    QVERIFY(dialogs_->boxes.isEmpty());
+    Q_UNUSED(a);
+}
+
+// Where a link of a text browser is shown, in its viewport: the occurrence of its text whose
+// target is href.
+QPoint LinkPosition(QTextBrowser* browser, const QString& text, const QString& href) {
+    QTextCursor found(browser->document());
+    while (!(found = browser->document()->find(text, found)).isNull()) {
+        QTextCursor inside(browser->document());
+        inside.setPosition(found.selectionStart() + 2);
+        if (inside.charFormat().anchorHref() == href)
+            return browser->cursorRect(inside).center();
+    }
+    return {-1, -1};
+}
+
+void FrmVerifierTest::detailsPaneShowsTheSelectedResultWhole() {
+    fs::create_directories(DataFolder() + "/sequences");
+    vtr::testsupport::WriteFileBytes(DataFolder() + "/sequences/Glow.las", "");
+    const QString data = QDir::toNativeSeparators(QString::fromStdString(DataFolder()));
+    const QString sequences = data + QDir::separator() + QStringLiteral("sequences");
+    const std::string show = DataFolder() + "/Show0.lss";  // missing, in a folder that is there
+    const std::string glow = DataFolder() + "/sequences/Glow.las";
+    const std::string elsewhere = folder_->File("no such folder") + "/Gone.las";
+    const ResultPtr conflict =
+        LibVerify::AddResult(Severity::Warning, "Channel conflict", 43, 43,
+                             {"[SHOW]: " + show, "[SECTION]: Background", "[SEQUENCE]: " + glow,
+                              "[APPLICATION]: " + AppFolder(), "[FILE]: " + elsewhere});
+    const ResultPtr bare = LibVerify::AddResult(Severity::Error, "Bare", 3, 3);
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    auto* pane = Find<QFrame>("frameResultDetails");
+    // The log tab has no result to show.
+    QVERIFY(!pane->isVisible());
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QVERIFY(pane->isVisible());
+    QTRY_VERIFY(Find<QLabel>("lblResultHelp")->height() > 0);  // laid out
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Select a result to see it whole here."));
+    QVERIFY(!Find<QPushButton>("cmdCopyResult")->isEnabled());
+
+    // A click on a result shows it whole.
+    QTest::mouseClick(Results()->viewport(), Qt::LeftButton, {},
+                      OnItem(Results(), ItemOf(Results(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Channel conflict"));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(), QStringLiteral("Warning, message number 43"));
+    auto* details = Find<QTextBrowser>("txtResultDetails");
+    const QString link = QStringLiteral("Open containing folder");
+    const QString links = QStringLiteral("   ") + link;
+    QCOMPARE(details->toPlainText().split(QLatin1Char('\n')),
+             (QStringList{QString::fromStdString("[SHOW]: " + show) + links,
+                          QStringLiteral("[SECTION]: Background"),
+                          QString::fromStdString("[SEQUENCE]: " + glow) + links,
+                          QString::fromStdString("[APPLICATION]: " + AppFolder()) + links,
+                          QString::fromStdString("[FILE]: " + elsewhere)}));
+    QVERIFY(details->textInteractionFlags() & Qt::TextSelectableByMouse);
+
+    // "Open containing folder" beside the sequence: the folder that holds it; beside the
+    // application folder: that folder.
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:3")));
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:0")));
+    QCOMPARE(
+        dialogs_->foldersOpened,
+        (QStringList{sequences,
+                     QDir::toNativeSeparators(QDir::cleanPath(QString::fromStdString(AppFolder()))),
+                     data}));
+    // A folder the desktop cannot show: a message box says so.
+    dialogs_->folderOpens = false;
+    QTest::mouseClick(details->viewport(), Qt::LeftButton, {},
+                      LinkPosition(details, link, QStringLiteral("folder:2")));
+    QCOMPARE(
+        dialogs_->boxes,
+        (QList<RecordingPresenter::Box>{{QStringLiteral("Error Opening Folder"),
+                                         QStringLiteral("Cannot open the folder ") + sequences}}));
+    dialogs_->boxes.clear();
+
+    // Copy: the whole result as text, as the report has it.
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    const QString expected = QString::fromStdString(
+        "Message Number: 43\nSeverity: Warning\nDescription: Channel conflict\n"
+        "Detail #1: [SHOW]: " +
+        show +
+        "\nDetail #2: [SECTION]: Background\n"
+        "Detail #3: [SEQUENCE]: " +
+        glow + "\nDetail #4: [APPLICATION]: " + AppFolder() + "\nDetail #5: [FILE]: " + elsewhere +
+        "\n");
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+    // Ctrl+C in the list copies the selected result too.
+    QApplication::clipboard()->clear();
+    Results()->setFocus();
+    QTest::keyClick(Results(), Qt::Key_C, Qt::ControlModifier);
+    QCOMPARE(QApplication::clipboard()->text(), expected);
+
+    // The help link: the result's topic (here the help file is missing, so its error).
+    auto* help = Find<QLabel>("lblResultHelp");
+    QTest::mouseClick(help, Qt::LeftButton, {}, QPoint(8, help->height() / 2));
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Help Context Error"));
+
+    // A result without details; then an ignored one says why it is ignored.
+    QTest::keyClick(Results(), Qt::Key_Down);
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(), QStringLiteral("Bare"));
+    QCOMPARE(details->toPlainText(), QStringLiteral("This result has no details."));
+    QApplication::clipboard()->clear();
+    QTest::mouseClick(Find<QPushButton>("cmdCopyResult"), Qt::LeftButton);
+    QCOMPARE(QApplication::clipboard()->text(),
+             QStringLiteral("Message Number: 3\nSeverity: Error\nDescription: Bare\n"));
+    window_->IgnoreMessageNumber(conflict);
+    window_->IgnoreResult(conflict);
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QTest::mouseClick(Ignored()->viewport(), Qt::LeftButton, {},
+                      OnItem(Ignored(), ItemOf(Ignored(), conflict)));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: this result, and all results "
+                            "with message number 43)"));
+    window_->StopIgnoringResult(conflict);
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(),
+             QStringLiteral("Warning, message number 43 (ignored: all results with message "
+                            "number 43)"));
+}
+
+FrmVerifierTest::Mix FrmVerifierTest::AddMix() {
+    auto conflict = [](const char* first, const char* firstSequence, const char* second,
+                       const char* secondSequence, const char* channel) {
+        return std::vector<std::string>{"[SHOW]: /d/Show0.lss",
+                                        std::string("[SECTION]: ") + first,
+                                        std::string("[SEQUENCE]: ") + firstSequence,
+                                        "[TRACK]: Track 1: T",
+                                        std::string("[CHANNEL]: ") + channel,
+                                        std::string("[SECTION]: ") + second,
+                                        std::string("[SEQUENCE]: ") + secondSequence,
+                                        "[TRACK]: Track 1: T",
+                                        std::string("[CHANNEL]: ") + channel};
+    };
+    Mix mix;
+    mix.conflict = LibVerify::AddResult(
+        Severity::Warning, "Channel conflict", 43, 43,
+        conflict("Animation", "/d/A.las", "Background", "/d/Glow.las", "Channel 1"));
+    mix.missingSequence =
+        LibVerify::AddResult(Severity::Error, "Sequence file does not exist", 23, 23,
+                             {"[SEQUENCE]: /d/Gone.lms", "[SHOW]: show /d/Show0.lss"});
+    // The same two sequences, the check walking from the other side.
+    mix.conflictBack = LibVerify::AddResult(
+        Severity::Warning, "Channel conflict", 43, 43,
+        conflict("Background", "/d/Glow.las", "Animation", "/d/A.las", "Channel 2"));
+    mix.noMedia = LibVerify::AddResult(Severity::Info, "Sequence uses no media file", 60, 60,
+                                       {"[SEQUENCE]: /d/A.las"});
+    mix.inside = LibVerify::AddResult(
+        Severity::Warning, "Conflicting channel settings in sequence", 27, 27,
+        {"[SEQUENCE]: /d/A.las", "[TRACK]: Track 2: U", "[CHANNEL]: Channel 3"});
+    mix.intensity =
+        LibVerify::AddResult(Severity::Warning, "Intensity file conflict", 49, 47,
+                             conflict("Animation", "/d/A.las", "Musical", "/d/B.lms", "Channel 4"));
+    mix.missingShow =
+        LibVerify::AddResult(Severity::Error, "Show file does not exist", 21, 21, {"/d/Show1.lss"});
+    return mix;
+}
+
+// Picks a grouping as a user does: the combo box, from the keyboard.
+void FrmVerifierTest::ChooseGroupBy(const QString& grouping) {
+    auto* box = Find<QComboBox>("cboGroupBy");
+    box->setFocus();
+    const int wanted = box->findText(grouping);
+    QVERIFY(wanted >= 0);
+    while (box->currentIndex() < wanted)
+        QTest::keyClick(box, Qt::Key_Down);
+    while (box->currentIndex() > wanted)
+        QTest::keyClick(box, Qt::Key_Up);
+    QCOMPARE(box->currentText(), grouping);
+}
+
+// Types a filter (replacing the one there) and applies it with Enter.
+void FrmVerifierTest::Filter(const QString& text) {
+    auto* box = Find<QLineEdit>("txtFilter");
+    box->setFocus();
+    QTest::keyClick(box, Qt::Key_A, Qt::ControlModifier);
+    QTest::keyClick(box, Qt::Key_Backspace);
+    QTest::keyClicks(box, text);
+    QTest::keyClick(box, Qt::Key_Return);
+}
+
+QStringList ChildTexts(const QTreeView* list, int group) {
+    QStringList texts;
+    const QAbstractItemModel* model = list->model();
+    const QModelIndex parent = model->index(group, 0);
+    for (int i = 0; i < model->rowCount(parent); ++i)
+        texts.append(model->index(i, 0, parent).data().toString());
+    return texts;
+}
+
+// A click on a group's expander.
+void ClickExpander(QTreeView* list, int group) {
+    const QRect rect = list->visualRect(list->model()->index(group, 0));
+    QTest::mouseClick(list->viewport(), Qt::LeftButton, {},
+                      QPoint(rect.left() - list->indentation() / 2, rect.center().y()));
+}
+
+void FrmVerifierTest::filterFindsTextAndSeverities() {
+    const Mix mix = AddMix();
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    QCOMPARE(tabs->currentIndex(), int(frmVerifier::OutputLogTab));
+    QCOMPARE(Shown(), QStringLiteral("7 of 7 shown"));
+
+    // Text in the details, whatever its letter case; looking for it turns to the results.
+    Filter(QStringLiteral("glow.LAS"));
+    QCOMPARE(tabs->currentIndex(), int(frmVerifier::ResultsTab));
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Channel conflict"), QStringLiteral("Channel conflict")}));
+    QCOMPARE(Shown(), QStringLiteral("2 of 7 shown"));
+    // The counters count what was found, not what is shown.
+    QCOMPARE(Find<QLabel>("lblErrorsCount")->text(), QStringLiteral("2"));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("4"));
+
+    // Text in the description; applied once typing pauses, without Enter.
+    auto* box = Find<QLineEdit>("txtFilter");
+    QTest::keyClick(box, Qt::Key_A, Qt::ControlModifier);
+    QTest::keyClicks(box, QStringLiteral("does not"));
+    QTRY_COMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Sequence file does not exist"),
+                                                    QStringLiteral("Show file does not exist")}));
+    QCOMPARE(Shown(), QStringLiteral("2 of 7 shown"));
+
+    // The severities, by their toggles.
+    Filter(QString());
+    QCOMPARE(Shown(), QStringLiteral("7 of 7 shown"));
+    QTest::mouseClick(Find<QToolButton>("chkShowWarnings"), Qt::LeftButton);
+    QCOMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Sequence file does not exist"),
+                                                QStringLiteral("Sequence uses no media file"),
+                                                QStringLiteral("Show file does not exist")}));
+    QCOMPARE(Shown(), QStringLiteral("3 of 7 shown"));
+    QTest::mouseClick(Find<QToolButton>("chkShowErrors"), Qt::LeftButton);
+    QCOMPARE(ListTexts(Results()), (QStringList{QStringLiteral("Sequence uses no media file")}));
+    // Text and severity together.
+    QTest::mouseClick(Find<QToolButton>("chkShowWarnings"), Qt::LeftButton);
+    Filter(QStringLiteral("A.las"));
+    QCOMPARE(ListTexts(Results()),
+             (QStringList{QStringLiteral("Channel conflict"), QStringLiteral("Channel conflict"),
+                          QStringLiteral("Sequence uses no media file"),
+                          QStringLiteral("Conflicting channel settings in sequence"),
+                          QStringLiteral("Intensity file conflict")}));
+    QTest::mouseClick(Find<QToolButton>("chkShowErrors"), Qt::LeftButton);
+    Filter(QString());
+
+    // The ignored list is filtered alike, and the count follows the list on view.
+    window_->IgnoreResult(mix.noMedia);
+    QCOMPARE(Shown(), QStringLiteral("6 of 6 shown"));
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QCOMPARE(Shown(), QStringLiteral("1 of 1 shown"));
+    QTest::mouseClick(Find<QToolButton>("chkShowInfo"), Qt::LeftButton);
+    QCOMPARE(Shown(), QStringLiteral("0 of 1 shown"));
+    QCOMPARE(RowCount(Ignored()), 0);
+    // Stopping to ignore a result hidden from the Results list: it is back, still hidden.
+    window_->StopIgnoringResult(mix.noMedia);
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QCOMPARE(Shown(), QStringLiteral("6 of 7 shown"));
+    QVERIFY(!ListTexts(Results()).contains(QStringLiteral("Sequence uses no media file")));
+}
+
+void FrmVerifierTest::errorsFirstAndBackToTheOrderFound() {
+    const Mix mix = AddMix();
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    const QStringList found{QStringLiteral("Channel conflict"),
+                            QStringLiteral("Sequence file does not exist"),
+                            QStringLiteral("Channel conflict"),
+                            QStringLiteral("Sequence uses no media file"),
+                            QStringLiteral("Conflicting channel settings in sequence"),
+                            QStringLiteral("Intensity file conflict"),
+                            QStringLiteral("Show file does not exist")};
+    const QStringList errorsFirst{QStringLiteral("Sequence file does not exist"),
+                                  QStringLiteral("Show file does not exist"),
+                                  QStringLiteral("Channel conflict"),
+                                  QStringLiteral("Channel conflict"),
+                                  QStringLiteral("Conflicting channel settings in sequence"),
+                                  QStringLiteral("Intensity file conflict"),
+                                  QStringLiteral("Sequence uses no media file")};
+    QCOMPARE(ListTexts(Results()), found);
+    // One click: errors, then warnings, then information, each in the order found.
+    auto* button = Find<QToolButton>("chkErrorsFirst");
+    QTest::mouseClick(button, Qt::LeftButton);
+    QVERIFY(button->isChecked());
+    QCOMPARE(ListTexts(Results()), errorsFirst);
+    QCOMPARE(ItemOf(Results(), mix.conflictBack).row(), 3);
+    // A result found later takes its place.
+    LibVerify::AddResult(Severity::Error, "Late error", 22, 22, {"/d/Late.lss"});
+    QCOMPARE(ListTexts(Results()).indexOf(QStringLiteral("Late error")), 2);
+    // The key: back to the order found.
+    QTest::keyClick(window_.get(), Qt::Key_E, Qt::ControlModifier);
+    QTRY_VERIFY(!button->isChecked());
+    QCOMPARE(ListTexts(Results()), found + QStringList{QStringLiteral("Late error")});
+
+    // A column's order replaces errors first; a third click on its header goes back to the
+    // order found.
+    QTest::mouseClick(button, Qt::LeftButton);
+    QTreeView* list = Results();
+    const int msgNumX = list->header()->sectionViewportPosition(frmVerifier::MsgNumColumn) + 5;
+    QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
+    QVERIFY(!button->isChecked());
+    QCOMPARE(ListTexts(list, frmVerifier::MsgNumColumn),
+             (QStringList{QStringLiteral("21"), QStringLiteral("22"), QStringLiteral("23"),
+                          QStringLiteral("27"), QStringLiteral("43"), QStringLiteral("43"),
+                          QStringLiteral("47"), QStringLiteral("60")}));
+    QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
+    QCOMPARE(ListTexts(list, frmVerifier::MsgNumColumn).constFirst(), QStringLiteral("60"));
+    QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
+    QCOMPARE(list->header()->sortIndicatorSection(), -1);
+    QCOMPARE(ListTexts(Results()), found + QStringList{QStringLiteral("Late error")});
+    // Errors first again clears the column's order.
+    QTest::mouseClick(list->header()->viewport(), Qt::LeftButton, {}, QPoint(msgNumX, 5));
+    QTest::mouseClick(button, Qt::LeftButton);
+    QCOMPARE(list->header()->sortIndicatorSection(), -1);
+    QCOMPARE(
+        ListTexts(Results()).mid(0, 3),
+        (QStringList{QStringLiteral("Sequence file does not exist"),
+                     QStringLiteral("Show file does not exist"), QStringLiteral("Late error")}));
+}
+
+void FrmVerifierTest::groupsCarryTheirCounts() {
+    const Mix mix = AddMix();
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QTreeView* list = Results();
+
+    ChooseGroupBy(QStringLiteral("Message"));
+    QCOMPARE(
+        ListTexts(list),
+        (QStringList{QStringLiteral("Message 43: Channel conflict (2)"),
+                     QStringLiteral("Message 23: Sequence file does not exist (1)"),
+                     QStringLiteral("Message 60: Sequence uses no media file (1)"),
+                     QStringLiteral("Message 27: Conflicting channel settings in sequence (1)"),
+                     QStringLiteral("Message 47: Intensity file conflict (1)"),
+                     QStringLiteral("Message 21: Show file does not exist (1)")}));
+    QCOMPARE(Shown(), QStringLiteral("7 of 7 shown"));
+    // A group's row spans the list; it opens into its results.
+    QVERIFY(list->isFirstColumnSpanned(0, QModelIndex()));
+    QVERIFY(!list->isExpanded(Row(list, 0)));
+    ClickExpander(list, 0);
+    QVERIFY(list->isExpanded(Row(list, 0)));
+    QCOMPARE(ChildTexts(list, 0),
+             (QStringList{QStringLiteral("Channel conflict"), QStringLiteral("Channel conflict")}));
+    QCOMPARE(ItemOf(list, mix.conflictBack).parent().row(), 0);
+
+    // By sequence pair: the conflicts between the same two sequences are one group whichever
+    // side the check began with; a conflict inside one sequence goes under that sequence.
+    ChooseGroupBy(QStringLiteral("Sequence pair"));
+    const QString glowPair =
+        QStringLiteral("A.las (Animation) and Glow.las (Background), show Show0.lss");
+    QCOMPARE(ListTexts(list),
+             (QStringList{glowPair + QStringLiteral(" (2)"), QStringLiteral("Inside A.las (1)"),
+                          QStringLiteral("A.las (Animation) and B.lms (Musical), show Show0.lss "
+                                         "(1)"),
+                          QStringLiteral("Other results (3)")}));
+    QCOMPARE(ChildTexts(list, 3), (QStringList{QStringLiteral("Sequence file does not exist"),
+                                               QStringLiteral("Sequence uses no media file"),
+                                               QStringLiteral("Show file does not exist")}));
+
+    // Ignoring from inside a group: the result pointed at; the group's count follows, and
+    // the next row is selected.
+    ClickExpander(list, 0);
+    QCOMPARE(ChildTexts(list, 0).size(), 2);
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    RightClick(list, ItemOf(list, mix.conflictBack));
+    QTRY_VERIFY(menu->isVisible());
+    ClickMenuEntry(menu, QStringLiteral("Ignore this result"));
+    QTRY_VERIFY(!menu->isVisible());
+    QCOMPARE(ListTexts(list).constFirst(), glowPair + QStringLiteral(" (1)"));
+    QCOMPARE(frmVerifier::ResultOf(list->currentIndex()), mix.conflict);
+    QCOMPARE(ListTexts(Ignored()), (QStringList{glowPair + QStringLiteral(" (1)")}));
+    QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("3"));
+    // A group's row has no result to act on: no menu.
+    RightClick(list, Row(list, 1));
+    QTest::qWait(50);
+    QVERIFY(!menu->isVisible());
+
+    // An opened group stays open, and the selected result selected, while the filter and
+    // the order change.
+    QTest::mouseClick(list->viewport(), Qt::LeftButton, {},
+                      OnItem(list, ItemOf(list, mix.conflict)));
+    QVERIFY(list->isExpanded(Row(list, 0)));
+    Filter(QStringLiteral("channel"));
+    QCOMPARE(ListTexts(list),
+             (QStringList{glowPair + QStringLiteral(" (1)"), QStringLiteral("Inside A.las (1)"),
+                          QStringLiteral("A.las (Animation) and B.lms (Musical), "
+                                         "show Show0.lss (1)")}));
+    QVERIFY(list->isExpanded(Row(list, 0)));
+    QCOMPARE(frmVerifier::ResultOf(list->currentIndex()), mix.conflict);
+    Filter(QString());
+
+    // Errors first puts the groups holding errors first.
+    QTest::mouseClick(Find<QToolButton>("chkErrorsFirst"), Qt::LeftButton);
+    QCOMPARE(ListTexts(list).constFirst(), QStringLiteral("Other results (3)"));
+    QCOMPARE(ChildTexts(list, 0), (QStringList{QStringLiteral("Sequence file does not exist"),
+                                               QStringLiteral("Show file does not exist"),
+                                               QStringLiteral("Sequence uses no media file")}));
+    QTest::mouseClick(Find<QToolButton>("chkErrorsFirst"), Qt::LeftButton);
+
+    // By show: a missing sequence goes under the show that names it.
+    ChooseGroupBy(QStringLiteral("Show"));
+    QCOMPARE(ListTexts(list),
+             (QStringList{QStringLiteral("/d/Show0.lss (3)"), QStringLiteral("/d/Show1.lss (1)"),
+                          QStringLiteral("Other results (2)")}));
+    // And back: one row per result, in the order found, the selection kept.
+    ChooseGroupBy(QStringLiteral("None"));
+    QCOMPARE(ListTexts(list),
+             (QStringList{QStringLiteral("Channel conflict"),
+                          QStringLiteral("Sequence file does not exist"),
+                          QStringLiteral("Sequence uses no media file"),
+                          QStringLiteral("Conflicting channel settings in sequence"),
+                          QStringLiteral("Intensity file conflict"),
+                          QStringLiteral("Show file does not exist")}));
+    QCOMPARE(frmVerifier::ResultOf(list->currentIndex()), mix.conflict);
+    QVERIFY(!list->isFirstColumnSpanned(0, QModelIndex()));
+    QVERIFY(dialogs_->boxes.isEmpty());
+}
+
+void FrmVerifierTest::groupingFollowsARun() {
+    // Grouped before the run: the results of the run arrive in their groups.
+    ChooseGroupBy(QStringLiteral("Message"));
+    Find<QRadioButton>("optTargetShow")->setChecked(true);
+    Find<QLineEdit>("txtTargetShow")->setText(QString::fromStdString(folder_->File("Gone.lss")));
+    Click("cmdVerify");
+    QTreeView* list = Results();
+    QVERIFY(RowCount(list) > 1);
+    int members = 0;
+    for (int group = 0; group < RowCount(list); ++group) {
+        const int count = list->model()->rowCount(Row(list, group));
+        members += count;
+        QVERIFY(Text(Row(list, group), 0).endsWith(QStringLiteral(" (%1)").arg(count)));
+    }
+    QCOMPARE(members, int(LibVerify::GetResults().size()));
+    QVERIFY(ListTexts(list).contains(QStringLiteral("Message 21: Show file does not exist (1)")));
+    QCOMPARE(Shown(), QStringLiteral("%1 of %1 shown").arg(members));
+}
+
+void FrmVerifierTest::detailColumnsShowFileNames() {
+    const std::string path =
+        "/a/long/folder/of/the/installation/with/many/parts/sequences/Background Glow.las";
+    const ResultPtr result = LibVerify::AddResult(Severity::Warning, "Channel is missing settings",
+                                                  30, 30, {"[SEQUENCE]: " + path});
+    Find<QTabWidget>("sstDetails")->setCurrentIndex(frmVerifier::ResultsTab);
+    QTreeView* list = Results();
+    // Wide columns that keep a path's ends, its file name among them, and tell the rest in
+    // the tool tip.
+    QVERIFY(list->columnWidth(frmVerifier::Details1Column) >= 380);
+    QCOMPARE(list->textElideMode(), Qt::ElideMiddle);
+    const QModelIndex detail = ItemOf(list, result).siblingAtColumn(frmVerifier::Details1Column);
+    QCOMPARE(detail.data(Qt::ToolTipRole).toString(),
+             QString::fromStdString("[SEQUENCE]: " + path));
+    QCOMPARE(ItemOf(list, result).data(Qt::ToolTipRole).toString(),
+             QString::fromStdString("Channel is missing settings\n[SEQUENCE]: " + path));
 }
 
 VTR_UI_TEST_MAIN(FrmVerifierTest)
