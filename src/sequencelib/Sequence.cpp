@@ -71,8 +71,9 @@ struct ChannelIdHash {
 // with their channel references (resolved once every channel is known), intensity files.
 class SequenceBuilder final : public detail::XmlPieceHandler {
   public:
-    SequenceBuilder(Sequence& sequence, const detail::XmlPieceReader& reader)
-        : sequence_(sequence), reader_(reader) {}
+    SequenceBuilder(Sequence& sequence, const detail::XmlPieceReader& reader,
+                    std::uint64_t maxKeptBytes)
+        : sequence_(sequence), reader_(reader), maxKept_(maxKeptBytes) {}
 
     void EnterElement(const pugi::xml_node& startTag) override {
         const Context parent = stack_.empty() ? Context::Document : stack_.back();
@@ -231,6 +232,15 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::FailLoad(detail::PlaceText(reader_.PlaceOf(attribute)), std::move(cause));
     }
 
+    // Counts what the sequence keeps for the element: however far a file's text expands, the
+    // loader keeps no more than maxKeptBytes of it.
+    void Keep(std::size_t bytes, const pugi::xml_node& element) {
+        kept_ += bytes;
+        if (kept_ > maxKept_)
+            FailKept(element);
+    }
+    [[noreturn]] void FailKept(const pugi::xml_node& element) const;
+
     // Marks a known attribute as read; a second one of the same name is refused.
     void Once(unsigned& seen, unsigned bit, const pugi::xml_attribute& attribute,
               const char* element) const {
@@ -333,6 +343,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
         if (!idAttribute || *idAttribute.value() == '\0')
             Fail(element, "the <channel> has no id");
+        Keep(kChannelBytes + name.size() + subsequence.size() + std::strlen(idAttribute.value()),
+             element);
         auto channel = std::make_shared<Channel>(idAttribute.value());
         if (!indexById_.Insert(std::string_view(channel->Id()), sequence_.Channels().size())
                  .second) {
@@ -399,6 +411,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     }
 
     void BeginTrack(const pugi::xml_node& element) {
+        Keep(kTrackBytes, element);
         auto track = std::make_shared<Track>();
         track->SetLength(sequence_.Length());
         unsigned seen = 0;
@@ -420,11 +433,13 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     void ReadChannelRef(const pugi::xml_node& element) {
         const pugi::xml_attribute idAttribute = element.attribute("id");
         const std::string_view id = idAttribute.value();
+        Keep(sizeof(std::shared_ptr<Channel>), element);
         if (const std::size_t index = FindChannel(id); index != kNoChannel) {
             track_->AddChannel(sequence_.Channels()[index]);
             return;
         }
         // Perhaps a channel further on: resolved when the file is read.
+        Keep(sizeof(PendingReference) + id.size(), element);
         pending_.push_back(
             {track_, track_->channels_.size(), std::string(id), reader_.PlaceOf(element)});
         track_->channels_.push_back(nullptr);
@@ -444,6 +459,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
             Fail(element, std::string("a second ") + IntensityFileKindName(fileKind) +
                               " intensity file (a sequence has at most one of each kind)");
         }
+        Keep(kIntensityFileBytes, element);
         auto file = std::make_shared<IntensityFile>(fileKind, element.attribute("name").value());
         intensityFile_ = file.get();
         sequence_.SetIntensityFile(std::move(file), trackIndex_);
@@ -472,6 +488,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                 count = Whole(a, "device", 0, kIntegerMax);
             }
         }
+        Keep(sizeof(DeviceAddress), element);
         intensityFile_->AddDevice(DeviceAddress(
             static_cast<int32_t>(deviceType), static_cast<int32_t>(network),
             static_cast<uint8_t>(unit), static_cast<int16_t>(start), static_cast<int16_t>(count)));
@@ -489,7 +506,22 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     int32_t trackIndex_ = -1;
     IntensityFile* intensityFile_ = nullptr;
     std::vector<PendingReference> pending_;
+    std::uint64_t maxKept_;
+    std::uint64_t kept_ = 0;
+
+    // What an object costs besides its texts: the object, its control block, its place in the
+    // sequence's list (and for a channel, its place in the index of ids).
+    static constexpr std::size_t kChannelBytes = sizeof(Channel) + 64;
+    static constexpr std::size_t kTrackBytes = sizeof(Track) + 48;
+    static constexpr std::size_t kIntensityFileBytes = sizeof(IntensityFile) + 32;
 };
+
+void SequenceBuilder::FailKept(const pugi::xml_node& element) const {
+    Fail(element,
+         "the sequence holds more channels, tracks and intensity-file devices than fit "
+         "in " +
+             detail::ByteCountText(maxKept_));
+}
 
 void SequenceBuilder::FailRepeated(const pugi::xml_attribute& attribute,
                                    const char* element) const {
@@ -539,7 +571,7 @@ bool Sequence::Load(const std::string& fileName, const ProgressCallback& progres
         readerOptions.maxDepth = options.maxDepth;
         readerOptions.tick = [&clock] { clock.Tick(); };
         detail::XmlPieceReader reader(*source, std::move(readerOptions));
-        SequenceBuilder builder(loaded, reader);
+        SequenceBuilder builder(loaded, reader, options.maxKeptBytes);
         reader.Run(builder, [&] {
             const std::uint64_t total = source->FileBytesTotal();
             if (total == 0)

@@ -24,6 +24,10 @@ inline constexpr std::uint64_t kMaxExpandedBytes = std::uint64_t{2} << 30;
 // the suite's own files never go past 4).
 inline constexpr int32_t kMaxNestingDepth = 100000;
 
+// The most memory a loaded sequence may keep for its channels, tracks and intensity files
+// (a channel costs some 200 bytes: five million channels fit).
+inline constexpr std::uint64_t kMaxKeptBytes = std::uint64_t{1} << 30;
+
 // How a load reads and when it stops. Each load has its own: loads of different sequences
 // may run on different threads at once, each calling back on its own thread.
 struct LoadOptions {
@@ -34,6 +38,9 @@ struct LoadOptions {
     std::uint64_t maxExpandedBytes = kMaxExpandedBytes;
     // Elements nested deeper than this are refused.
     int32_t maxDepth = kMaxNestingDepth;
+    // A sequence that would keep more than this is refused as it is read, however small its
+    // file (compressed text of a few megabytes can hold hundreds of millions of elements).
+    std::uint64_t maxKeptBytes = kMaxKeptBytes;
     // Asked as the load goes, after each percent told and at least once per pollInterval
     // of work in between (the loading thread's processor time): false stops the load.
     std::function<bool()> keepGoing;

@@ -367,6 +367,26 @@ TEST(SequenceLoad, IsAskedWhetherToGoOnBetweenPercentsAndStopsWhenTold) {
     EXPECT_TRUE(std::find(told.begin(), told.end(), 100) == told.end());
 }
 
+// Compressed text of a few megabytes can hold millions of small elements: what a load keeps
+// of them is counted as it is read and bounded.
+TEST(SequenceLoad, WhatALoadKeepsIsBoundedAsItIsRead) {
+    TempFolder folder;
+    std::string channels;
+    for (int i = 1; i <= 1000; ++i)
+        channels += "<channel id=\"" + std::to_string(i) + "\" name=\"Channel\"/>\n";
+    const std::string path = folder.Write("many.las", Gzip(WithChannels(10, channels)));
+    LoadOptions options;
+    options.maxKeptBytes = std::uint64_t{16} << 10;
+    const std::string error = testing::ErrorOf([&] { Sequence().Load(path, {}, options); });
+    EXPECT_THAT(error, ::testing::StartsWith("Cannot load sequence file \"" + path + "\": line "));
+    EXPECT_THAT(error, ::testing::EndsWith(": the sequence holds more channels, tracks and "
+                                           "intensity-file devices than fit in 16 KiB"));
+    EXPECT_EQ(kMaxKeptBytes, std::uint64_t{1} << 30);
+    Sequence s;
+    EXPECT_TRUE(s.Load(path));
+    EXPECT_EQ(s.Channels().size(), 1000u);
+}
+
 TEST(SequenceModel, BuiltInMemoryLikeALoadedOne) {
     Sequence s;
     auto track = std::make_shared<Track>();
