@@ -6,7 +6,6 @@
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
-#include "sequencelib/ShellCommandMap.h"
 
 namespace vtr {
 
@@ -20,7 +19,7 @@ void CheckShellCommandSet::Check() {
         return;  // CheckSequenceLoads reports a sequence that cannot be loaded
     const std::string identifier = sequence->ShellCommand();
     const std::string command =
-        ResumeOr(std::string(), [&] { return seqlib::ShellCommandMap().CommandText(identifier); });
+        ResumeOr(std::string(), [&] { return LibVerify::ShellCommandText(identifier); });
     if (!command.empty())
         return;
     ResumeStep([&] { LibVerify::AddResult(Messages::ShellCommandNotSet, {filename_}); });

@@ -114,6 +114,7 @@ class TempFilesRemover {
 
 constexpr const char* kReportWhat = "results file";
 constexpr const char* kReportSource = "vantori-verify";
+constexpr const char* kBaselineWhat = "baseline";
 
 // Why the run cannot start, or the empty text when it can.
 std::string SetUpProblem(const Options& options) {
@@ -178,6 +179,11 @@ int RunVerify(const Options& givenOptions, Console& console) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
     }
+    // A store that is missing or cannot be read still gives a verification (with no
+    // settings), but the user is told first which store it was and why it was that one.
+    const RegistryStore::Description store = RegistryStore::Describe();
+    if (const std::string problem = store.Problem(); !problem.empty())
+        Fail(console.err, problem);
 
     std::unique_ptr<ProgressLine> progress;
     if (console.errIsTerminal && !options.quiet)
@@ -225,6 +231,8 @@ int RunVerify(const Options& givenOptions, Console& console) {
         // The report would replace the target or the store: said before the run, not after.
         if (options.output)
             OutputFile::RefuseInput(*options.output, kReportWhat, kReportSource);
+        if (options.writeBaseline)
+            OutputFile::RefuseInput(*options.writeBaseline, kBaselineWhat, kReportSource);
     } catch (const VtrError& error) {
         Fail(console.err, error.Description());
         return ExitStatus::CannotSetUp;
@@ -240,6 +248,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
     record.cancelled = observer.Cancelled() || LibVerify::IsCancelled();
     record.checksPerformed = LibVerify::ChecksPerformedCount();
     record.results = observer.TakeResults();
+    record.store = store;
     if (baseline)
         baseline->Mark(record);
 
@@ -268,7 +277,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
                               " was not written: the verification was cancelled");
     } else if (options.writeBaseline) {
         try {
-            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), "baseline",
+            OutputFile::Write(*options.writeBaseline, Baseline::TextOf(record), kBaselineWhat,
                               kReportSource);
         } catch (const VtrError& error) {
             Fail(console.err, error.Description());
@@ -303,6 +312,9 @@ int Main(int argc, const char* const* argv, Console& console) {
             case Command::Unignore:
                 return RunIgnoreCommand(options, console.out, console.err);
             case Command::ListIgnored:
+                if (const std::string problem = RegistryStore::Describe().Problem();
+                    !problem.empty())
+                    Fail(console.err, problem);
                 return RunListIgnored(options, console.out);
         }
         return ExitStatus::Usage;

@@ -51,8 +51,8 @@ const char* const kFooter =
     "\n"
     "Exit status: 0 when no warning or error was found (ignored results do not count), 1 when "
     "warnings but no errors were found, 2 when errors were found (--fail-on and --baseline "
-    "change which findings count), 3 when the target or the settings store cannot be set up, "
-    "64 for wrong usage.\n"
+    "change which findings count), 3 when the target, the settings store, the report or the "
+    "baseline cannot be set up or written, 64 for wrong usage, 130 when the run was cancelled.\n"
     "\n"
     "The settings store is the file named by --registry, else by VANTORI_REGISTRY, else the "
     "per-user default. The verification never changes a file of the suite.";

@@ -9,7 +9,7 @@
 #include "engine/IgnoreKeyText.h"
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
-#include "environment/RegistryStore.h"
+#include "engine/VtrError.h"
 
 namespace vtr::cli {
 namespace {
@@ -21,11 +21,6 @@ void ReloadIgnoreLists() {
     LibVerify::IgnoredMessageNumbers().Clear();
     LibVerify::IgnoredResultKeys().Clear();
     IgnoreLists::LoadIgnoreLists();
-}
-
-std::string StoreName() {
-    const auto file = RegistryStore::CurrentFile();
-    return file ? "the settings store " + *file : std::string("the registry");
 }
 
 std::string Quoted(const std::string& text) {
@@ -78,19 +73,11 @@ std::optional<std::string> KeyFromArgument(const std::string& argument) {
 
 int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& err) {
     const bool ignore = options.command == Command::Ignore;
-    ReloadIgnoreLists();
 
     std::string what;
     std::string key;  // the result's key, for --key
-    bool listed = false;
     if (options.messageNumber) {
-        const std::string text = std::to_string(*options.messageNumber);
-        what = "Results with message number " + text;
-        listed = IgnoreLists::IsMessageNumberIgnored(text);
-        if (ignore)
-            IgnoreLists::IgnoreMessageNumber(*options.messageNumber);
-        else
-            IgnoreLists::UnignoreMessageNumber(*options.messageNumber);
+        what = "Results with message number " + std::to_string(*options.messageNumber);
     } else {
         const std::string given = options.ignoreKey.value_or("");
         const std::optional<std::string> decoded = KeyFromArgument(given);
@@ -101,8 +88,7 @@ int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& er
             return ExitStatus::Usage;
         }
         key = *decoded;
-        const std::optional<Result> result = ResultFromIgnoreKey(key);
-        if (!result) {
+        if (!ResultFromIgnoreKey(key)) {
             err << "vantori-verify: " << Quoted(given)
                 << " is not a result's key: a key is the message number, \"-\", then each "
                    "detail followed by \" / \" (as \"vantori-verify ignored\" and --format "
@@ -110,25 +96,24 @@ int RunIgnoreCommand(const Options& options, std::ostream& out, std::ostream& er
             return ExitStatus::Usage;
         }
         what = "The result " + QuotedKey(key);
-        listed = IgnoreLists::IsIgnoreKeyIgnored(key);
-        if (ignore)
-            IgnoreLists::IgnoreResult(*result);
-        else
-            IgnoreLists::UnignoreResult(*result);
     }
 
-    // The lists swallow store failures; read them back to see whether the change was kept.
-    if (listed != ignore) {
-        ReloadIgnoreLists();
-        const bool nowListed =
-            options.messageNumber
-                ? IgnoreLists::IsMessageNumberIgnored(std::to_string(*options.messageNumber))
-                : IgnoreLists::IsIgnoreKeyIgnored(key);
-        if (nowListed != ignore) {
-            err << "vantori-verify: the ignore list could not be saved in " << StoreName() << "\n";
-            return ExitStatus::CannotSetUp;
+    // One change of the list in the store, under its lock; a failure says what went wrong.
+    IgnoreLists::ChangeOutcome outcome;
+    try {
+        if (options.messageNumber) {
+            outcome = ignore ? IgnoreLists::AddIgnoredMessageNumber(*options.messageNumber)
+                             : IgnoreLists::RemoveIgnoredMessageNumber(*options.messageNumber);
+        } else {
+            outcome = ignore ? IgnoreLists::AddIgnoredResultKey(key)
+                             : IgnoreLists::RemoveIgnoredResultKey(key);
         }
+    } catch (const VtrError& error) {
+        err << "vantori-verify: " << error.Description() << "\n";
+        return ExitStatus::CannotSetUp;
     }
+    const bool listed = outcome == IgnoreLists::ChangeOutcome::AlreadyListed ||
+                        outcome == IgnoreLists::ChangeOutcome::Removed;
 
     const bool plural = options.messageNumber.has_value();
     if (ignore) {

@@ -1,6 +1,8 @@
 #include "Interrupt.h"
 
 #include <csignal>
+#include <cstdlib>
+#include <exception>
 
 #include "environment/LibFile.h"
 
@@ -124,6 +126,27 @@ InterruptGuard::~InterruptGuard() {
 
 Interruption InterruptGuard::Requested() {
     return static_cast<Interruption>(static_cast<int>(requested));
+}
+
+namespace {
+
+std::terminate_handler previousTerminate = nullptr;
+
+[[noreturn]] void RemoveTempFilesAndTerminate() {
+    LibFile::RemoveRegisteredTempFiles();
+    if (previousTerminate != nullptr)
+        previousTerminate();  // says what escaped, and aborts
+    std::abort();
+}
+
+}  // namespace
+
+void InstallLastResortCleanUp() {
+    if (std::get_terminate() != RemoveTempFilesAndTerminate)
+        previousTerminate = std::set_terminate(RemoveTempFilesAndTerminate);
+#ifdef SIGXFSZ
+    std::signal(SIGXFSZ, SIG_IGN);
+#endif
 }
 
 const char* CancellingNotice(Interruption interruption) {

@@ -30,6 +30,11 @@ class InterruptGuard {
     static Interruption Requested();
 };
 
+// For the rest of the program: an error that ends it through std::terminate (one that
+// escaped a destructor, say) removes the registered temporary files first, and a limit on the
+// size of files (SIGXFSZ) makes the write fail with its reason instead of killing the program.
+void InstallLastResortCleanUp();
+
 // What the program says when it starts cancelling for that reason, e.g. "Ctrl-C: cancelling
 // ...".
 const char* CancellingNotice(Interruption interruption);

@@ -316,11 +316,19 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
         results.push_back(std::move(item));
     }
 
+    nlohmann::ordered_json store;
+    store["path"] = record.store.file ? nlohmann::ordered_json(*record.store.file) : nullptr;
+    store["chosenBy"] = record.store.OriginWord();
+    store["exists"] = record.store.condition.exists;
+    store["understood"] = record.store.condition.understood;
+    store["readOnly"] = record.store.condition.readOnly;
+
     const SeverityCounts counts = grouping.Counts(Listing::NotIgnored);
     nlohmann::ordered_json document;
     document["program"] = "vantori-verify";
     document["version"] = kVersionText;
     document["target"] = std::move(target);
+    document["store"] = std::move(store);
     document["cancelled"] = record.cancelled;
     document["checksPerformed"] = record.checksPerformed;
     document["errors"] = counts.errors;

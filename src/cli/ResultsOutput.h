@@ -9,6 +9,7 @@
 #include "CommandLine.h"
 #include "engine/Result.h"
 #include "engine/ResultGrouping.h"
+#include "environment/RegistryStore.h"
 
 namespace vtr::cli {
 
@@ -27,6 +28,7 @@ struct RunRecord {
     bool cancelled = false;
     int32_t checksPerformed = 0;
     std::vector<RecordedResult> results;  // every result in the order produced
+    RegistryStore::Description store;     // the settings store the run read
 };
 
 // How the results are presented. None of it changes the results; with the defaults the
@@ -60,7 +62,9 @@ int ExitStatusOf(const RunRecord& record, FailOn failOn = FailOn::Warning);
 void WriteText(std::ostream& out, const RunRecord& record, const Presentation& presentation = {});
 
 // The JSON form: one object with "program", "version", "target" ({"kind", "file"}; no "file"
-// for the schedule), "cancelled", "checksPerformed", "errors", "warnings", "counts"
+// for the schedule), "store" ({"path" (null for the Windows registry), "chosenBy" ("option",
+// "environment", "default" or "registry"), "exists", "understood", "readOnly"}), "cancelled",
+// "checksPerformed", "errors", "warnings", "counts"
 // ({"errors", "warnings", "info", "ignored"}) and "results", every listed result in the
 // order produced with "severity" (number), "severityText", "messageNumber",
 // "helpContextId", "summary", "details" (array), "ignored" and "ignoreKey" (the key in the

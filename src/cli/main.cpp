@@ -2,9 +2,11 @@
 #include <iostream>
 
 #include "App.h"
+#include "Interrupt.h"
 #include "Terminal.h"
 
 int main(int argc, char** argv) {
+    vtr::cli::InstallLastResortCleanUp();
     vtr::cli::Console console{std::cout, std::cerr, vtr::cli::IsTerminal(stderr),
                               vtr::cli::TerminalColumns(stderr)};
     console.outIsColorTerminal =

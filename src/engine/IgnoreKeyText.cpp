@@ -57,10 +57,15 @@ bool IsUtf8(std::string_view bytes) {
 }
 
 std::string Encode(std::string_view key) {
-    bool plain = IsUtf8(key) && !key.starts_with(kEscapedMarker);
-    for (const char c : key)
-        plain = plain && !IsControl(static_cast<unsigned char>(c));
-    if (plain)
+    // Most keys are plain ASCII text: one pass over the bytes tells.
+    bool ascii = true;
+    bool control = false;
+    for (const char c : key) {
+        const auto byte = static_cast<unsigned char>(c);
+        ascii = ascii && byte < 0x80;
+        control = control || IsControl(byte);
+    }
+    if (!control && !key.starts_with(kEscapedMarker) && (ascii || IsUtf8(key)))
         return std::string(key);
 
     static constexpr char kHex[] = "0123456789ABCDEF";

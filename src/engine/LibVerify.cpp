@@ -4,6 +4,7 @@
 #include <deque>
 #include <exception>
 #include <memory>
+#include <optional>
 #include <unordered_map>
 #include <unordered_set>
 #include <utility>
@@ -21,6 +22,7 @@
 #include "schedule/WeekTime.h"
 #include "schedule/YearSchedule.h"
 #include "sequencelib/Sequence.h"
+#include "sequencelib/ShellCommandMap.h"
 #include "show/Show.h"
 #include "show/WholeFile.h"
 
@@ -93,6 +95,8 @@ struct VerificationState {
     std::unordered_map<std::string, std::shared_ptr<seqlib::Sequence>> sequenceCache;
     // Shows by file name; only shows that were read and parsed are kept.
     std::unordered_map<std::string, ShowPtr> showCache;
+    // The shell-command map, read at its first use in a run.
+    std::optional<seqlib::ShellCommandMap::Contents> shellCommands;
     std::string tempShowFile;
     std::string tempWeeklyFile;
     std::string tempYearlyFile;
@@ -391,6 +395,7 @@ void BeginVerification() {
     state.ignoredMessageNumbers.Clear();
     state.sequenceCache.clear();
     state.showCache.clear();
+    state.shellCommands.reset();
     state.warnings.clear();
     state.weeklySchedule = nullptr;
     state.yearlySchedule = nullptr;
@@ -529,6 +534,15 @@ NetworkPreferences& GetNetworkPreferences() {
     if (!state.networkPreferences)
         state.networkPreferences = std::make_unique<NetworkPreferences>();
     return *state.networkPreferences;
+}
+
+std::string ShellCommandText(const std::string& identifier) {
+    VerificationState& state = State();
+    if (!state.shellCommands) {
+        state.shellCommands =
+            seqlib::ShellCommandMap::Contents::Read(seqlib::ShellCommandMap().MapFilePath());
+    }
+    return state.shellCommands->CommandText(identifier);
 }
 
 std::shared_ptr<Schedule> GetSchedule() {

@@ -113,6 +113,9 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName);
 std::shared_ptr<Show> LoadShow(const std::string& fileName);
 // The network preferences, loaded afresh at the start of each run.
 NetworkPreferences& GetNetworkPreferences();
+// The command of that identifier in the shell-command map ("" when none), the map being read
+// once per run, at the first question.
+std::string ShellCommandText(const std::string& identifier);
 // The schedules of the current target, loaded on first request in a run.
 std::shared_ptr<Schedule> GetSchedule();
 std::shared_ptr<YearSchedule> GetYearSchedule();

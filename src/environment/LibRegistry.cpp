@@ -61,17 +61,24 @@ void CloseRegistryKey(KeyHandle& handle) {
     handle = 0;
 }
 
+// The readers answer a missing key or value with the default straight away: a run reads
+// thousands of absent settings (the network preferences alone ask for 7 values of each of
+// 999 universes), and none of them is an error.
+
 int32_t GetRegLong(RootKey root, const std::string& keyPath, const std::string& valueName,
                    int32_t defaultValue) {
     KeyHandle key = 0;
     const int32_t value = ResumeOr(defaultValue, [&] {
-        key = OpenRegistryKey(root, keyPath, kKeyRead);
+        if (Store().OpenKey(root, keyPath, kKeyRead, key) != 0) {
+            key = 0;
+            return defaultValue;
+        }
         uint8_t buffer[4] = {0, 0, 0, 0};
         uint32_t type = 0;
         uint32_t size = sizeof buffer;
         if (Store().QueryValue(key, valueName, &type, buffer, &size) != 0 ||
             type != RegistryStore::ValueType::Dword) {
-            Fail("GetRegLong", "Error getting registry value");
+            return defaultValue;
         }
         return static_cast<int32_t>(
             static_cast<uint32_t>(buffer[0]) | static_cast<uint32_t>(buffer[1]) << 8 |
@@ -90,17 +97,19 @@ std::string GetRegString(RootKey root, const std::string& keyPath, const std::st
                          const std::string& defaultValue) {
     KeyHandle key = 0;
     std::string value = ResumeOr(defaultValue, [&] {
-        key = OpenRegistryKey(root, keyPath, kKeyRead);
-        uint32_t length = 0;
-        if (Store().QueryValue(key, valueName, nullptr, nullptr, &length) != 0) {
-            Fail("GetRegString", "RegQueryValueEx failure (length)");
+        if (Store().OpenKey(root, keyPath, kKeyRead, key) != 0) {
+            key = 0;
+            return defaultValue;
         }
+        uint32_t length = 0;
+        if (Store().QueryValue(key, valueName, nullptr, nullptr, &length) != 0)
+            return defaultValue;
         if (length == 0)
             return std::string();
         std::string buffer(length, ' ');
         if (Store().QueryValue(key, valueName, nullptr, reinterpret_cast<uint8_t*>(buffer.data()),
                                &length) != 0) {
-            Fail("GetRegString", "RegQueryValueEx failure");
+            return defaultValue;
         }
         // The stored length counts the terminating NUL, which is dropped.
         buffer.resize(length == 0 ? 0 : length - 1);
@@ -108,6 +117,14 @@ std::string GetRegString(RootKey root, const std::string& keyPath, const std::st
     });
     CloseRegistryKey(key);
     return value;
+}
+
+bool KeyExists(RootKey root, const std::string& keyPath) {
+    KeyHandle key = 0;
+    if (Store().OpenKey(root, keyPath, kKeyRead, key) != 0)
+        return false;
+    CloseRegistryKey(key);
+    return true;
 }
 
 void SetRegLong(RootKey root, const std::string& keyPath, const std::string& valueName,

@@ -36,11 +36,13 @@ bool GetRegBool(RootKey root, const std::string& keyPath, const std::string& val
 std::string GetRegString(RootKey root, const std::string& keyPath, const std::string& valueName,
                          const std::string& defaultValue);
 
+// True when the key exists (and can be opened for reading). Never fails.
+bool KeyExists(RootKey root, const std::string& keyPath);
+
 // Writers raise "RegSetValueEx failure" (after closing the key).
 void SetRegLong(RootKey root, const std::string& keyPath, const std::string& valueName,
                 int32_t value);
-void SetRegBool(RootKey root, const std::string& keyPath, const std::string& valueName,
-                bool value);
+void SetRegBool(RootKey root, const std::string& keyPath, const std::string& valueName, bool value);
 void SetRegString(RootKey root, const std::string& keyPath, const std::string& valueName,
                   const std::string& value);
 

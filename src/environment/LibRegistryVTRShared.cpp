@@ -1,5 +1,6 @@
 #include "environment/LibRegistryVTRShared.h"
 
+#include "environment/LibRegistry.h"
 #include "environment/LibRegistryVTR.h"
 
 namespace vtr::LibRegistryVTRShared {
@@ -13,6 +14,10 @@ std::string SharedKeyPath(const std::string& subkey) {
 
 std::string SharedKeyFullPath(const std::string& subkey) {
     return LibRegistryVTR::SuiteKeyPath(SharedKeyPath(subkey));
+}
+
+bool SharedKeyExists(const std::string& subkey) {
+    return LibRegistry::KeyExists(LibRegistry::kCurrentUser, SharedKeyFullPath(subkey));
 }
 
 bool GetSharedBool(const std::string& valueName, const std::string& subkey, bool defaultValue) {

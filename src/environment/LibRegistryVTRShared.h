@@ -11,6 +11,9 @@ std::string SharedKeyPath(const std::string& subkey);
 // The full path below HKEY_CURRENT_USER.
 std::string SharedKeyFullPath(const std::string& subkey);
 
+// True when the shared key (or its subkey) exists. Never fails.
+bool SharedKeyExists(const std::string& subkey);
+
 bool GetSharedBool(const std::string& valueName, const std::string& subkey, bool defaultValue);
 int32_t GetSharedLong(const std::string& valueName, const std::string& subkey,
                       int32_t defaultValue);

@@ -2,6 +2,7 @@
 
 #include "engine/VtrError.h"
 #include "environment/LibRegistryVTRShared.h"
+#include "environment/RegistryStore.h"
 
 namespace vtr {
 
@@ -10,6 +11,7 @@ namespace {
 using LibRegistryVTRShared::GetSharedBool;
 using LibRegistryVTRShared::GetSharedLong;
 using LibRegistryVTRShared::GetSharedString;
+using LibRegistryVTRShared::SharedKeyExists;
 
 // A DWORD read as a byte; a stored value that does not fit one reads as the default.
 uint8_t GetSharedByte(const std::string& valueName, const std::string& key, uint8_t defaultValue) {
@@ -29,6 +31,17 @@ void VTRNetworkPreferences::InitFromRegistry(const std::string& key, uint8_t def
                                              int32_t defaultACNIPType,
                                              const std::string& defaultACNIPAddress,
                                              int32_t defaultACNSendToPort) {
+    if (!SharedKeyExists(key)) {
+        // Every value of a missing key takes its default; no need to ask for each.
+        *this = VTRNetworkPreferences();
+        oldKRP_ = defaultOldKRP;
+        port_ = defaultPort;
+        usesACN_ = defaultUsesACN;
+        acnIPType_ = defaultACNIPType;
+        acnIPAddress_ = defaultACNIPAddress;
+        acnSendToPort_ = defaultACNSendToPort;
+        return;
+    }
     oldKRP_ = GetSharedBool("OldKRP-NewRegVal", key, defaultOldKRP);
     port_ = GetSharedByte("NetworkVantori", key, defaultPort);
     speed_ = GetSharedLong("VtrSpeed", key, 2);
@@ -41,6 +54,10 @@ void VTRNetworkPreferences::InitFromRegistry(const std::string& key, uint8_t def
 }
 
 void DMXUniversePrefs::InitFromRegistry(const std::string& key) {
+    if (!SharedKeyExists(key)) {
+        *this = DMXUniversePrefs();
+        return;
+    }
     adapter_ = GetSharedString("Adapter", key, "");
     protocol_ = GetSharedLong("Protocol", key, 0);
     usesE131_ = GetSharedBool("Uses E131", key, false);
@@ -81,6 +98,8 @@ std::string NetworkPreferences::CurrentRevKey() {
 void NetworkPreferences::InitFromRegistry(bool force) {
     if (loaded_ && !force)
         return;
+    // Some seven thousand values, most of them usually absent: one look at the store.
+    RegistryStore::ReadScope reading;
     const std::string revKey = CurrentRevKey();
     listNetworks_ = GetSharedBool("ListNetworks", revKey, false);
     tolvexPort_ = GetSharedByte("NetworkTolvex", revKey, 0);

@@ -60,10 +60,6 @@ std::string_view Content(std::string_view raw) {
     return raw;
 }
 
-bool EndsWithNewline(const std::string& raw) {
-    return !raw.empty() && raw.back() == '\n';
-}
-
 // The line end of a line as it stands ("" for a last line without one).
 std::string LineEnd(std::string_view raw) {
     if (raw.size() >= 2 && raw.substr(raw.size() - 2) == "\r\n")
@@ -214,6 +210,40 @@ bool Continues(std::string_view piece, bool& quoted) {
     return !quoted && !piece.empty() && piece.back() == '\\';
 }
 
+// The logical line that starts at pos: its physical line or, for a value line continued with
+// a trailing backslash, every physical line it takes. Moves pos past it. Gives its content
+// with the continuations joined: a view of the text, or of buffer when it was continued.
+// Without a buffer only pos moves (and nothing is given for a continued line).
+std::string_view NextLogicalLine(std::string_view text, std::size_t& pos, std::string* buffer) {
+    auto endOf = [&](std::size_t from) {
+        const std::size_t newline = text.find('\n', from);
+        return newline == std::string_view::npos ? text.size() : newline + 1;
+    };
+    std::size_t end = endOf(pos);
+    const std::string_view content = TrimLeft(Content(text.substr(pos, end - pos)));
+    pos = end;
+    if (content.empty() || (content.front() != '"' && content.front() != '@'))
+        return content;
+    bool quoted = false;
+    bool more = Continues(content, quoted);
+    if (!more || end == text.size())
+        return content;
+    if (buffer != nullptr)
+        buffer->assign(content);
+    while (more && end < text.size()) {
+        if (buffer != nullptr)
+            buffer->resize(buffer->find_last_not_of(" \t\r"));  // drops the backslash
+        const std::size_t next = endOf(end);
+        const std::string_view piece = TrimLeft(Content(text.substr(end, next - end)));
+        if (buffer != nullptr)
+            *buffer += piece;
+        end = next;
+        more = Continues(piece, quoted);
+    }
+    pos = end;
+    return buffer != nullptr ? std::string_view(*buffer) : std::string_view();
+}
+
 // "xx,xx,..." into bytes; nothing when a byte is not hexadecimal.
 std::optional<std::string> ReadHexBytes(std::string_view list) {
     std::string bytes;
@@ -250,7 +280,11 @@ std::optional<Value> ReadValueData(std::string_view data, bool unicode) {
         auto text = ReadQuoted(data, pos);
         if (!text || !Trim(data.substr(pos)).empty())
             return std::nullopt;
-        return Value::String(*text);
+        Value value;
+        value.type = RegistryStore::ValueType::String;
+        value.data = std::move(*text);
+        value.data += '\0';
+        return value;
     }
     if (StartsWithNoCase(data, "dword:")) {
         const std::string_view digits = data.substr(6);
@@ -339,16 +373,6 @@ std::string JoinPath(const KeyPath& path) {
     return out;
 }
 
-bool SamePath(const KeyPath& a, const KeyPath& b) {
-    if (a.size() != b.size())
-        return false;
-    for (std::size_t i = 0; i < a.size(); ++i) {
-        if (!EqualsNoCase(a[i], b[i]))
-            return false;
-    }
-    return true;
-}
-
 // True when prefix names the key path itself or one of its ancestors.
 bool IsWithin(const KeyPath& path, const KeyPath& prefix) {
     if (prefix.size() > path.size())
@@ -362,12 +386,25 @@ bool IsWithin(const KeyPath& path, const KeyPath& prefix) {
 
 // --- The tree ------------------------------------------------------------------------------
 
+// Notes kept in the tree while a batch is open: a value's line or a key's section end may be
+// a line the batch adds (tagged with its number among the batch's new lines) or a section it
+// adds at the end (tagged with the section's number).
+constexpr std::size_t kNewLineTag = std::size_t(1) << 62;
+constexpr std::size_t kNewSectionTag = std::size_t(1) << 61;
+constexpr std::size_t kTags = kNewLineTag | kNewSectionTag;
+
+bool Tagged(std::size_t at, std::size_t tag) {
+    return at != kNoLine && (at & tag) != 0;
+}
+
 Key& EnsureKey(Key& root, const KeyPath& path) {
     Key* key = &root;
     for (const std::string& name : path) {
-        auto [it, added] = key->subkeys.try_emplace(Fold(name));
-        if (added)
+        auto it = key->subkeys.find(name);
+        if (it == key->subkeys.end()) {
+            it = key->subkeys.emplace(Fold(name), Key{}).first;
             it->second.name = name;
+        }
         key = &it->second;
     }
     return *key;
@@ -377,7 +414,7 @@ template <typename K>  // Key or const Key
 K* FindIn(K& root, const KeyPath& path) {
     K* key = &root;
     for (const std::string& name : path) {
-        auto it = key->subkeys.find(Fold(name));
+        auto it = key->subkeys.find(name);
         if (it == key->subkeys.end())
             return nullptr;
         key = &it->second;
@@ -389,15 +426,62 @@ void RemoveKey(Key& root, const KeyPath& path) {
     if (path.empty())
         return;  // a root is never removed
     KeyPath parent(path.begin(), path.end() - 1);
-    if (Key* key = FindIn(root, parent))
-        key->subkeys.erase(Fold(path.back()));
+    if (Key* key = FindIn(root, parent)) {
+        if (auto it = key->subkeys.find(path.back()); it != key->subkeys.end())
+            key->subkeys.erase(it);
+    }
 }
 
-void SetIn(Key& key, const std::string& name, const Value& value) {
-    auto [it, added] = key.values.try_emplace(Fold(name));
-    if (added)
-        it->second.name = name;
-    it->second.value = value;
+void SetIn(Key& key, std::string name, Value value, std::size_t line) {
+    auto it = key.values.find(name);
+    if (it == key.values.end()) {
+        it = key.values.emplace(Fold(name), NamedValue{}).first;
+        it->second.name = std::move(name);
+    }
+    it->second.value = std::move(value);
+    it->second.line = line;
+}
+
+// Calls visit on every key of the tree (without recursion: a path may be very deep).
+template <typename Visit>
+void ForEachKey(Key& root, Visit&& visit) {
+    std::vector<Key*> pending{&root};
+    while (!pending.empty()) {
+        Key* key = pending.back();
+        pending.pop_back();
+        visit(*key);
+        for (auto& [folded, subkey] : key->subkeys)
+            pending.push_back(&subkey);
+    }
+}
+
+std::string SectionLine(const KeyPath& path, bool removal = false) {
+    std::string section = removal ? "[-" : "[";
+    section += kRootName;
+    if (!path.empty())
+        section += "\\" + JoinPath(path);
+    return section + "]";
+}
+
+// The text's last line, from lastBegin on, is blank.
+bool EndsWithBlankLine(const std::string& text, std::size_t lastBegin) {
+    return Trim(Content(std::string_view(text).substr(lastBegin))).empty();
+}
+
+// Appends a section (and its one value line, when given) at the end of the text, whose last
+// logical line starts at lastBegin: the last line gets a line end if it has none, and a
+// blank line stands between it and the section unless it is blank itself.
+void AppendSection(std::string& text, std::size_t lastBegin, const KeyPath& path,
+                   const std::string& valueLine, const std::string& newline) {
+    if (!text.empty()) {
+        if (text.back() != '\n')
+            text += newline;
+        if (!EndsWithBlankLine(text, lastBegin))
+            text += newline;
+    }
+    text += SectionLine(path) + newline;
+    if (!valueLine.empty())
+        text += valueLine + newline;
 }
 
 }  // namespace
@@ -418,6 +502,17 @@ Value Value::Dword(uint32_t number) {
     for (int i = 0; i < 4; ++i)
         value.data += static_cast<char>((number >> (8 * i)) & 0xFF);
     return value;
+}
+
+bool FoldedLess::operator()(std::string_view a, std::string_view b) const {
+    const std::size_t common = std::min(a.size(), b.size());
+    for (std::size_t i = 0; i < common; ++i) {
+        const auto x = static_cast<unsigned char>(Upper(a[i]));
+        const auto y = static_cast<unsigned char>(Upper(b[i]));
+        if (x != y)
+            return x < y;
+    }
+    return a.size() < b.size();
 }
 
 std::string Fold(std::string_view name) {
@@ -460,23 +555,28 @@ bool SameContent(const Key& a, const Key& b) {
 // --- Reading -------------------------------------------------------------------------------
 
 Document Document::Parse(std::string_view bytes) {
-    auto begins = [&](std::string_view mark) { return bytes.substr(0, mark.size()) == mark; };
+    return Parse(std::string(bytes));
+}
+
+Document Document::Parse(std::string&& bytes) {
+    const std::string_view view(bytes);
+    auto begins = [&](std::string_view mark) { return view.substr(0, mark.size()) == mark; };
     if (begins("\xFF\xFE")) {
-        bytes.remove_prefix(2);
-        if (bytes.size() % 2 != 0)
+        if (view.size() % 2 != 0)
             return Unreadable();
-        return FromText(Utf16LeToText(bytes), Encoding::Utf16Le, true);
+        return FromText(Utf16LeToText(view.substr(2)), Encoding::Utf16Le, true);
     }
     if (begins("\xEF\xBB\xBF")) {
-        return FromText(std::string(bytes.substr(3)), Encoding::Utf8, true);
+        bytes.erase(0, 3);
+        return FromText(std::move(bytes), Encoding::Utf8, true);
     }
     // UTF-16LE without a byte-order mark: the header's first letter has a zero high byte.
-    if (bytes.size() >= 2 && bytes[0] != '\0' && bytes[1] == '\0') {
-        if (bytes.size() % 2 != 0)
+    if (view.size() >= 2 && view[0] != '\0' && view[1] == '\0') {
+        if (view.size() % 2 != 0)
             return Unreadable();
-        return FromText(Utf16LeToText(bytes), Encoding::Utf16Le, false);
+        return FromText(Utf16LeToText(view), Encoding::Utf16Le, false);
     }
-    return FromText(std::string(bytes), Encoding::Utf8, false);
+    return FromText(std::move(bytes), Encoding::Utf8, false);
 }
 
 Document Document::Unreadable() {
@@ -489,133 +589,171 @@ Document Document::FromText(std::string text, Encoding encoding, bool byteOrderM
     Document document;
     document.encoding_ = encoding;
     document.byteOrderMark_ = byteOrderMark;
-    document.Classify(text);
-    if (document.understood_)
-        document.Build();
+    document.text_ = std::move(text);
+    document.Read();
     return document;
 }
 
-void Document::Classify(const std::string& text) {
-    std::vector<std::string> physical;
-    for (std::size_t start = 0; start < text.size();) {
-        std::size_t end = text.find('\n', start);
-        end = (end == std::string::npos) ? text.size() : end + 1;
-        physical.push_back(text.substr(start, end - start));
-        start = end;
+bool Document::Reading::SaysTheSameAs(const Reading& other) const {
+    if (line.kind != other.line.kind)
+        return false;
+    switch (line.kind) {
+        case LineKind::Section:
+        case LineKind::DeleteSection:
+            return line.currentUser == other.line.currentUser && path == other.path;
+        case LineKind::Value:
+            return name == other.name && value == other.value;
+        case LineKind::DeleteValue:
+            return name == other.name;
+        default:
+            return true;
     }
+}
+
+Document::Reading Document::ReadLine(std::string_view text, std::size_t& pos, bool unicode) {
+    Reading reading;
+    Line& line = reading.line;
+    line.begin = pos;
+    std::string buffer;
+    const std::string_view content = NextLogicalLine(text, pos, &buffer);
+    if (Trim(content).empty()) {
+        line.kind = LineKind::Blank;
+    } else if (content.front() == ';') {
+        line.kind = LineKind::Comment;
+    } else if (content.front() == '[') {
+        const std::string_view section = Trim(content);
+        if (section.back() == ']' && section.size() > 2) {
+            std::string_view inner = section.substr(1, section.size() - 2);
+            const bool removal = inner.front() == '-';
+            if (removal)
+                inner.remove_prefix(1);
+            KeyPath names = SplitKeyPath(inner);
+            const std::string_view root = inner.substr(0, inner.find('\\'));
+            line.kind = removal ? LineKind::DeleteSection : LineKind::Section;
+            line.currentUser = EqualsNoCase(root, kRootName) || EqualsNoCase(root, kRootShort);
+            if (!names.empty() && EqualsNoCase(names.front(), root))
+                names.erase(names.begin());
+            reading.path = std::move(names);
+        }
+    } else if (content.front() == '"' || content.front() == '@') {
+        std::size_t at = 0;
+        std::optional<std::string> name;
+        if (content.front() == '@') {
+            name = std::string();
+            at = 1;
+        } else {
+            name = ReadQuoted(content, at);
+        }
+        const std::string_view rest = TrimLeft(content.substr(at));
+        if (name && !rest.empty() && rest.front() == '=') {
+            const std::string_view data = Trim(rest.substr(1));
+            reading.name = std::move(*name);
+            if (data == "-") {
+                line.kind = LineKind::DeleteValue;
+            } else if (auto value = ReadValueData(data, unicode)) {
+                line.kind = LineKind::Value;
+                reading.value = std::move(*value);
+            }
+        }
+    }
+    return reading;
+}
+
+void Document::Read() {
+    lines_.clear();
+    root_ = Key{};
+    hasHeader_ = false;
+    unicode_ = true;
+    understood_ = true;
+    const std::string_view text = text_;
+    const std::size_t firstEnd = text.find('\n');
+    newline_ = firstEnd != std::string_view::npos && firstEnd > 0 && text[firstEnd - 1] == '\r'
+                   ? "\r\n"
+                   : "\n";
 
     if (std::all_of(text.begin(), text.end(),
                     [](char c) { return IsBlank(c) || c == '\r' || c == '\n'; })) {
         // An empty store: it has no header yet and gets one on the first change.
-        for (const std::string& raw : physical) {
-            Line line;
-            line.kind = LineKind::Blank;
-            line.raw = raw;
-            lines_.push_back(std::move(line));
+        for (std::size_t pos = 0; pos < text.size();) {
+            lines_.push_back(Line{pos, LineKind::Blank, false});
+            const std::size_t end = text.find('\n', pos);
+            pos = end == std::string_view::npos ? text.size() : end + 1;
         }
         return;
     }
-    const std::string_view header = Trim(Content(physical.front()));
+    const std::size_t headerEnd = firstEnd == std::string_view::npos ? text.size() : firstEnd + 1;
+    const std::string_view header = Trim(Content(text.substr(0, headerEnd)));
     if (EqualsNoCase(header, kHeader5)) {
         unicode_ = true;
     } else if (EqualsNoCase(header, kHeader4)) {
         unicode_ = false;
     } else {
         understood_ = false;
+        text_.clear();
+        text_.shrink_to_fit();
         return;
     }
     hasHeader_ = true;
-    Line headerLine;
-    headerLine.kind = LineKind::Header;
-    headerLine.raw = physical.front();
-    lines_.push_back(std::move(headerLine));
-
-    for (std::size_t i = 1; i < physical.size(); ++i) {
-        Line line;
-        line.raw = physical[i];
-        const std::string_view content = TrimLeft(Content(physical[i]));
-        if (Trim(content).empty()) {
-            line.kind = LineKind::Blank;
-        } else if (content.front() == ';') {
-            line.kind = LineKind::Comment;
-        } else if (content.front() == '[') {
-            const std::string_view section = Trim(content);
-            if (section.back() == ']' && section.size() > 2) {
-                std::string_view inner = section.substr(1, section.size() - 2);
-                const bool removal = inner.front() == '-';
-                if (removal)
-                    inner.remove_prefix(1);
-                KeyPath names = SplitKeyPath(inner);
-                const std::size_t rootEnd = inner.find('\\');
-                const std::string_view root = inner.substr(0, rootEnd);
-                line.kind = removal ? LineKind::DeleteSection : LineKind::Section;
-                line.currentUser = EqualsNoCase(root, kRootName) || EqualsNoCase(root, kRootShort);
-                if (!names.empty() && EqualsNoCase(names.front(), root)) {
-                    names.erase(names.begin());
-                }
-                line.path = std::move(names);
-            }
-        } else if (content.front() == '"' || content.front() == '@') {
-            // Join continued lines into one logical line.
-            std::string joined(content);
-            bool quoted = false;
-            bool more = Continues(joined, quoted);
-            while (more && i + 1 < physical.size()) {
-                joined.resize(joined.find_last_not_of(" \t\r"));  // drops the backslash
-                line.raw += physical[++i];
-                const std::string_view piece = TrimLeft(Content(physical[i]));
-                joined += piece;
-                more = Continues(piece, quoted);
-            }
-            std::size_t pos = 0;
-            std::optional<std::string> name;
-            if (joined.front() == '@') {
-                name = std::string();
-                pos = 1;
-            } else {
-                name = ReadQuoted(joined, pos);
-            }
-            const std::string_view rest = TrimLeft(std::string_view(joined).substr(pos));
-            if (name && !rest.empty() && rest.front() == '=') {
-                const std::string_view data = Trim(rest.substr(1));
-                line.name = *name;
-                if (data == "-") {
-                    line.kind = LineKind::DeleteValue;
-                } else if (auto value = ReadValueData(data, unicode_)) {
-                    line.kind = LineKind::Value;
-                    line.value = std::move(*value);
-                }
-            }
-        }
-        lines_.push_back(std::move(line));
+    lines_.push_back(Line{0, LineKind::Header, false});
+    Key* current = nullptr;  // the key whose section we are in, when it is one we read
+    for (std::size_t pos = headerEnd; pos < text.size();) {
+        Reading reading = ReadLine(text, pos, unicode_);
+        const Line line = reading.line;
+        Note(std::move(reading), lines_.size(), current);
+        lines_.push_back(line);
     }
 }
 
-void Document::Build() {
-    root_ = Key{};
-    Key* current = nullptr;  // the key whose section we are in, when it is one we read
-    for (const Line& line : lines_) {
-        switch (line.kind) {
-            case LineKind::Section:
-                current = line.currentUser ? &EnsureKey(root_, line.path) : nullptr;
-                break;
-            case LineKind::DeleteSection:
-                if (line.currentUser)
-                    RemoveKey(root_, line.path);
-                current = nullptr;
-                break;
-            case LineKind::Value:
-                if (current)
-                    SetIn(*current, line.name, line.value);
-                break;
-            case LineKind::DeleteValue:
-                if (current)
-                    current->values.erase(Fold(line.name));
-                break;
-            default:
-                break;
-        }
+void Document::Note(Reading&& reading, std::size_t index, Key*& current) {
+    switch (reading.line.kind) {
+        case LineKind::Section:
+            current = reading.line.currentUser ? &EnsureKey(root_, reading.path) : nullptr;
+            if (current)
+                current->sectionEnd = index;
+            break;
+        case LineKind::DeleteSection:
+            if (reading.line.currentUser)
+                RemoveKey(root_, reading.path);
+            current = nullptr;
+            break;
+        case LineKind::Value:
+            if (current) {
+                SetIn(*current, std::move(reading.name), std::move(reading.value), index);
+                current->sectionEnd = index;
+            }
+            break;
+        case LineKind::DeleteValue:
+            if (current) {
+                if (auto value = current->values.find(reading.name); value != current->values.end())
+                    current->values.erase(value);
+                current->sectionEnd = index;
+            }
+            break;
+        case LineKind::Other:
+            if (current)
+                current->sectionEnd = index;
+            break;
+        default:
+            break;
     }
+}
+
+std::string_view Document::Raw(std::size_t line) const {
+    const std::size_t begin = lines_[line].begin;
+    const std::size_t end = line + 1 < lines_.size() ? lines_[line + 1].begin : text_.size();
+    return std::string_view(text_).substr(begin, end - begin);
+}
+
+Document::Reading Document::Reread(std::size_t line) const {
+    if (lines_[line].kind == LineKind::Header) {
+        Reading reading;
+        reading.line = lines_[line];
+        return reading;
+    }
+    std::size_t pos = 0;
+    Reading reading = ReadLine(Raw(line), pos, unicode_);
+    reading.line.begin = lines_[line].begin;
+    return reading;
 }
 
 const Key* Document::FindKey(const KeyPath& path) const {
@@ -624,13 +762,8 @@ const Key* Document::FindKey(const KeyPath& path) const {
 
 // --- Changing ------------------------------------------------------------------------------
 
-std::string Document::Newline() const {
-    for (const Line& line : lines_) {
-        if (EndsWithNewline(line.raw)) {
-            return line.raw.size() >= 2 && line.raw[line.raw.size() - 2] == '\r' ? "\r\n" : "\n";
-        }
-    }
-    return "\n";
+std::string Document::HeaderLine() const {
+    return std::string(kHeader5) + newline_;
 }
 
 std::string Document::RenderValueLine(const std::string& name, const Value& value) const {
@@ -651,51 +784,291 @@ std::string Document::RenderValueLine(const std::string& name, const Value& valu
     std::string bytes = data;
     if (unicode_)
         bytes = TextToUtf16Le(data).value_or(std::string());
-    return HexList(bytes, left + "hex(1):", Newline());
+    return HexList(bytes, left + "hex(1):", newline_);
 }
 
-std::vector<std::string> Document::Raws() const {
-    std::vector<std::string> raws;
-    raws.reserve(lines_.size() + 4);
-    for (const Line& line : lines_)
-        raws.push_back(line.raw);
+std::string Document::ValueNameAt(std::size_t line) const {
+    if (Tagged(line, kNewLineTag))
+        return newLines_[line & ~kTags].meant.name;
+    // The name stands at the start of the line, on its first physical line.
+    const std::string_view content = TrimLeft(Content(Raw(line)));
+    if (!content.empty() && content.front() == '@')
+        return std::string();
+    std::size_t at = 0;
+    return ReadQuoted(content, at).value_or(std::string());
+}
+
+std::size_t Document::AddNewLine(std::string raw, Reading meant) {
+    newLines_.push_back(NewLine{std::move(raw), std::move(meant)});
+    return newLines_.size() - 1;
+}
+
+std::size_t Document::NewSectionFor(const KeyPath& path) {
+    Reading meant;
+    meant.line.kind = LineKind::Section;
+    meant.line.currentUser = true;
+    meant.path = path;
+    NewSection section;
+    section.lines.push_back(AddNewLine(SectionLine(path) + newline_, std::move(meant)));
+    newSections_.push_back(std::move(section));
+    return kNewSectionTag | (newSections_.size() - 1);
+}
+
+void Document::BeginBatch() {
+    if (batch_)
+        return;
+    batch_ = true;
+    modifiedBeforeBatch_ = modified_;
+}
+
+Status Document::EndBatch() {
+    if (!batch_)
+        return Code::Success;
+    batch_ = false;
+    if (newLines_.empty()) {
+        Forget();
+        return Code::Success;
+    }
+    if (SettleInPlace() || SettleAtTheEnd()) {
+        Forget();
+        modified_ = true;
+        return Code::Success;
+    }
+    Undo();
+    return Code::InvalidData;
+}
+
+void Document::Forget() {
+    newLines_.clear();
+    replaced_.clear();
+    inserted_.clear();
+    newSections_.clear();
+    changedKeys_.clear();
+    changedKeyNames_.clear();
+}
+
+void Document::Undo() {
+    const bool modified = modifiedBeforeBatch_;
+    Document original = FromText(std::move(text_), encoding_, byteOrderMark_);
+    *this = std::move(original);
+    modified_ = modified;
+}
+
+// The changed text, line by line: visit(expect, source, raw, addLineEnd) for each line in
+// order, where source is the line (Same, SameButLineEnd) or the new line (Meant) it comes
+// from, and addLineEnd tells that the line (the last one of the file, which has none) gets
+// the file's line end because lines follow it now.
+template <typename Visit>
+void Document::PlanChangedText(Visit&& visit) const {
+    bool written = false;   // something is written already
+    bool lastBlank = true;  // the last line written is blank
     if (!hasHeader_) {
-        // A store without a header yet (empty): it starts with one.
-        raws.insert(raws.begin(), std::string(kHeader5) + Newline());
+        const std::string header = HeaderLine();
+        visit(Expect::Header, 0, std::string_view(header), false);
+        written = true;
+        lastBlank = false;
     }
-    return raws;
-}
-
-void Document::AppendSection(std::vector<std::string>& raws, const KeyPath& path,
-                             const std::string& valueLine) const {
-    const std::string newline = Newline();
-    if (!raws.empty()) {
-        if (!EndsWithNewline(raws.back()))
-            raws.back() += newline;
-        if (!Trim(Content(raws.back())).empty())
-            raws.push_back(newline);
-    }
-    std::string section = "[" + std::string(kRootName);
-    if (!path.empty())
-        section += "\\" + JoinPath(path);
-    raws.push_back(section + "]" + newline);
-    if (!valueLine.empty())
-        raws.push_back(valueLine + newline);
-}
-
-Status Document::Commit(const std::vector<std::vector<std::string>>& candidates,
-                        const Key& expected) {
-    for (const std::vector<std::string>& raws : candidates) {
-        std::string text;
-        for (const std::string& raw : raws)
-            text += raw;
-        Document changed = FromText(std::move(text), encoding_, byteOrderMark_);
-        if (!changed.understood_ || !SameContent(changed.root_, expected) || !changed.Serialize()) {
-            continue;
+    auto replacement = replaced_.begin();
+    auto insertion = inserted_.begin();
+    for (std::size_t i = 0; i < lines_.size(); ++i) {
+        const bool insertsAfter = insertion != inserted_.end() && insertion->first == i;
+        const bool followed = insertsAfter || (i + 1 == lines_.size() && !newSections_.empty());
+        Expect expect = Expect::Same;
+        std::size_t source = i;
+        std::string_view raw = Raw(i);
+        if (replacement != replaced_.end() && replacement->first == i) {
+            expect = Expect::Meant;
+            source = replacement->second;
+            raw = newLines_[source].raw;
+            ++replacement;
         }
+        const bool addLineEnd = followed && (raw.empty() || raw.back() != '\n');
+        if (addLineEnd && expect == Expect::Same)
+            expect = Expect::SameButLineEnd;
+        visit(expect, source, raw, addLineEnd);
+        written = written || !raw.empty() || addLineEnd;
+        lastBlank = Trim(Content(raw)).empty();
+        if (insertsAfter) {
+            for (const std::size_t n : insertion->second)
+                visit(Expect::Meant, n, std::string_view(newLines_[n].raw), false);
+            lastBlank = false;
+            ++insertion;
+        }
+    }
+    for (const NewSection& section : newSections_) {
+        if (written && !lastBlank)
+            visit(Expect::Blank, 0, std::string_view(newline_), false);
+        for (const std::size_t n : section.lines)
+            visit(Expect::Meant, n, std::string_view(newLines_[n].raw), false);
+        written = true;
+        lastBlank = false;
+    }
+}
+
+// Writes the batch where each change belongs and reads the text back, line by line: every
+// line the batch did not touch must span the same bytes it did (it then reads as it did),
+// and every line it wrote must read as what it was written to say. Then the tree, which the
+// changes already updated, is exactly what the new text gives.
+bool Document::SettleInPlace() {
+    if (encoding_ == Encoding::Utf16Le) {
+        for (const NewLine& line : newLines_) {
+            if (!TextToUtf16Le(line.raw))
+                return false;
+        }
+    }
+    std::size_t size = 0;
+    std::size_t count = 0;
+    PlanChangedText([&](Expect, std::size_t, std::string_view raw, bool addLineEnd) {
+        size += raw.size() + (addLineEnd ? newline_.size() : 0);
+        ++count;
+    });
+    std::string out;
+    out.reserve(size);
+    PlanChangedText([&](Expect, std::size_t, std::string_view raw, bool addLineEnd) {
+        out += raw;
+        if (addLineEnd)
+            out += newline_;
+    });
+
+    // Read it back.
+    const std::string_view text = out;
+    const std::size_t firstEnd = text.find('\n');
+    const std::size_t headerEnd = firstEnd == std::string_view::npos ? text.size() : firstEnd + 1;
+    if (!EqualsNoCase(Trim(Content(text.substr(0, headerEnd))), unicode_ ? kHeader5 : kHeader4))
+        return false;
+    std::vector<Line> lines;
+    lines.reserve(count);
+    std::vector<std::size_t> newIndexOfNew(newLines_.size(), kNoLine);
+    std::size_t pos = 0;
+    bool same = true;
+    PlanChangedText([&](Expect expect, std::size_t source, std::string_view raw, bool addLineEnd) {
+        const std::size_t end = pos + raw.size() + (addLineEnd ? newline_.size() : 0);
+        if (!same)
+            return;
+        if (lines.empty()) {
+            // The header: the first physical line.
+            same = end == headerEnd;
+            lines.push_back(Line{0, LineKind::Header, false});
+        } else if (expect == Expect::Same) {
+            std::size_t next = pos;
+            NextLogicalLine(text, next, nullptr);
+            same = next == end;
+            lines.push_back(Line{pos, lines_[source].kind, lines_[source].currentUser});
+        } else {
+            std::size_t next = pos;
+            const Reading reading = ReadLine(text, next, unicode_);
+            same = next == end;
+            switch (expect) {
+                case Expect::SameButLineEnd:
+                    same = same && reading.SaysTheSameAs(Reread(source));
+                    break;
+                case Expect::Meant:
+                    same = same && reading.SaysTheSameAs(newLines_[source].meant);
+                    newIndexOfNew[source] = lines.size();
+                    break;
+                case Expect::Blank:
+                    same = same && reading.line.kind == LineKind::Blank;
+                    break;
+                default:
+                    same = false;  // only the first line is a header
+                    break;
+            }
+            lines.push_back(reading.line);
+        }
+        pos = end;
+    });
+    if (!same || pos != text.size())
+        return false;
+
+    // The text stands: the tree's notes move to the new lines. A line of the old text moves
+    // down by the lines added before it.
+    std::vector<std::pair<std::size_t, std::size_t>> addedBefore;  // (line, lines added up to it)
+    std::size_t added = hasHeader_ ? 0 : 1;
+    for (const auto& [line, after] : inserted_) {
+        added += after.size();
+        addedBefore.emplace_back(line, added);
+    }
+    auto moved = [&](std::size_t line) {
+        auto later = std::lower_bound(addedBefore.begin(), addedBefore.end(),
+                                      std::make_pair(line, std::size_t(0)));
+        return line + (later == addedBefore.begin() ? (hasHeader_ ? 0 : 1) : (later - 1)->second);
+    };
+    auto lineNow = [&](std::size_t at) {
+        if (at == kNoLine)
+            return kNoLine;
+        if (Tagged(at, kNewLineTag))
+            return newIndexOfNew[at & ~kTags];
+        if (auto replacement = replaced_.find(at); replacement != replaced_.end())
+            return newIndexOfNew[replacement->second];
+        return moved(at);
+    };
+    auto sectionEndNow = [&](std::size_t at) {
+        if (at == kNoLine)
+            return kNoLine;
+        if (Tagged(at, kNewSectionTag))
+            return newIndexOfNew[newSections_[at & ~kTags].lines.back()];
+        if (auto after = inserted_.find(at); after != inserted_.end())
+            return newIndexOfNew[after->second.back()];
+        return lineNow(at);
+    };
+    ForEachKey(root_, [&](Key& key) {
+        key.sectionEnd = sectionEndNow(key.sectionEnd);
+        for (auto& [folded, value] : key.values)
+            value.line = lineNow(value.line);
+    });
+    text_ = std::move(out);
+    lines_ = std::move(lines);
+    hasHeader_ = true;
+    return true;
+}
+
+// The plainer way, for a batch whose lines did not read back in place: every key the batch
+// changed gets a section of its own at the end of the file with the values the batch set.
+// The whole text is read again and must give exactly the changed tree.
+bool Document::SettleAtTheEnd() {
+    std::string out = hasHeader_ ? std::string() : HeaderLine();
+    out += text_;
+    std::size_t lastBegin = lines_.empty() ? 0 : lines_.back().begin + out.size() - text_.size();
+    for (const KeyPath& path : changedKeys_) {
+        const Key* key = FindIn(root_, path);
+        if (key == nullptr)
+            return false;
+        std::string values;
+        for (const auto& [folded, value] : key->values) {
+            if (Tagged(value.line, kNewLineTag) || replaced_.count(value.line) != 0)
+                values += RenderValueLine(value.name, value.value) + newline_;
+        }
+        const std::size_t sectionBegin = out.size();
+        AppendSection(out, lastBegin, path, std::string(), newline_);
+        out += values;
+        const std::size_t lastLine = out.rfind('\n', out.size() - 2);
+        lastBegin = std::max(sectionBegin, lastLine == std::string::npos ? 0 : lastLine + 1);
+    }
+    if (encoding_ == Encoding::Utf16Le && !TextToUtf16Le(out))
+        return false;
+    Document changed = FromText(std::move(out), encoding_, byteOrderMark_);
+    if (!changed.understood_ || !SameContent(changed.root_, root_))
+        return false;
+    text_ = std::move(changed.text_);
+    lines_ = std::move(changed.lines_);
+    root_ = std::move(changed.root_);
+    unicode_ = changed.unicode_;
+    hasHeader_ = true;
+    return true;
+}
+
+Status Document::Apply(const std::vector<std::string>& candidates, const Key& expected) {
+    for (const std::string& text : candidates) {
+        if (encoding_ == Encoding::Utf16Le && !TextToUtf16Le(text))
+            continue;
+        Document changed = FromText(text, encoding_, byteOrderMark_);
+        if (!changed.understood_ || !SameContent(changed.root_, expected))
+            continue;
+        text_ = std::move(changed.text_);
         lines_ = std::move(changed.lines_);
         root_ = std::move(changed.root_);
         unicode_ = changed.unicode_;
+        newline_ = changed.newline_;
         hasHeader_ = true;
         modified_ = true;
         return Code::Success;
@@ -706,80 +1079,51 @@ Status Document::Commit(const std::vector<std::vector<std::string>>& candidates,
 Status Document::SetValue(const KeyPath& keyPath, const std::string& name, const Value& value) {
     if (!understood_)
         return Code::BadDatabase;
-    const Key* key = FindKey(keyPath);
+    Key* key = FindIn(root_, keyPath);
     if (key == nullptr)
         return Code::KeyDeleted;
     auto existing = key->values.find(Fold(name));
     if (existing != key->values.end() && existing->second.value == value)
         return Code::Success;
 
-    Key expected = root_;
-    SetIn(*FindIn(expected, keyPath), name, value);
-
-    // Where the value stands now: its last assignment that nothing removed afterwards;
-    // otherwise the end of the key's last section that nothing removed afterwards.
-    constexpr std::size_t kNone = static_cast<std::size_t>(-1);
-    std::size_t assignment = kNone;
-    std::size_t insertAt = kNone;
-    bool inKey = false;
-    for (std::size_t i = 0; i < lines_.size(); ++i) {
-        const Line& line = lines_[i];
-        switch (line.kind) {
-            case LineKind::Section:
-                inKey = line.currentUser && SamePath(line.path, keyPath);
-                if (inKey)
-                    insertAt = i + 1;
-                break;
-            case LineKind::DeleteSection:
-                inKey = false;
-                if (line.currentUser && IsWithin(keyPath, line.path) && !line.path.empty()) {
-                    assignment = kNone;
-                    insertAt = kNone;
-                }
-                break;
-            case LineKind::Value:
-                if (inKey) {
-                    if (EqualsNoCase(line.name, name))
-                        assignment = i;
-                    insertAt = i + 1;
-                }
-                break;
-            case LineKind::DeleteValue:
-                if (inKey) {
-                    if (EqualsNoCase(line.name, name))
-                        assignment = kNone;
-                    insertAt = i + 1;
-                }
-                break;
-            case LineKind::Other:
-                if (inKey)
-                    insertAt = i + 1;
-                break;
-            default:
-                break;
+    const bool ownBatch = !batch_;
+    BeginBatch();
+    Reading meant;
+    meant.line.kind = LineKind::Value;
+    meant.value = value;
+    if (existing != key->values.end()) {
+        // The line that gives the value now is rewritten, keeping its spelling of the name
+        // and its line end.
+        const std::size_t at = existing->second.line;
+        meant.name = ValueNameAt(at);
+        const std::string raw = RenderValueLine(meant.name, value);
+        if (Tagged(at, kNewLineTag)) {
+            NewLine& line = newLines_[at & ~kTags];
+            line.raw = raw + LineEnd(line.raw);
+            line.meant = std::move(meant);
+        } else if (auto replacement = replaced_.find(at); replacement != replaced_.end()) {
+            NewLine& line = newLines_[replacement->second];
+            line.raw = raw + LineEnd(line.raw);
+            line.meant = std::move(meant);
+        } else {
+            replaced_[at] = AddNewLine(raw + LineEnd(Raw(at)), std::move(meant));
         }
+        existing->second.value = value;
+    } else {
+        // A new line at the end of the key's last section, or a new section at the end.
+        meant.name = name;
+        const std::size_t line = AddNewLine(RenderValueLine(name, value) + newline_, meant);
+        if (key->sectionEnd == kNoLine)
+            key->sectionEnd = NewSectionFor(keyPath);
+        if (Tagged(key->sectionEnd, kNewSectionTag))
+            newSections_[key->sectionEnd & ~kTags].lines.push_back(line);
+        else
+            inserted_[key->sectionEnd].push_back(line);
+        SetIn(*key, name, value, kNewLineTag | line);
     }
-
-    std::vector<std::vector<std::string>> candidates;
-    const std::size_t offset = hasHeader_ ? 0 : 1;
-    if (assignment != kNone) {
-        std::vector<std::string> raws = Raws();
-        std::string& raw = raws[assignment + offset];
-        raw = RenderValueLine(lines_[assignment].name, value) + LineEnd(raw);
-        candidates.push_back(std::move(raws));
-    } else if (insertAt != kNone) {
-        std::vector<std::string> raws = Raws();
-        const std::size_t at = insertAt + offset;
-        if (!EndsWithNewline(raws[at - 1]))
-            raws[at - 1] += Newline();
-        raws.insert(raws.begin() + static_cast<std::ptrdiff_t>(at),
-                    RenderValueLine(name, value) + Newline());
-        candidates.push_back(std::move(raws));
-    }
-    std::vector<std::string> appended = Raws();
-    AppendSection(appended, keyPath, RenderValueLine(name, value));
-    candidates.push_back(std::move(appended));
-    return Commit(candidates, expected);
+    if (changedKeyNames_.insert(Fold(JoinPath(keyPath))).second)
+        changedKeys_.push_back(keyPath);
+    return ownBatch ? EndBatch() : Code::Success;
 }
 
 Status Document::CreateKey(const KeyPath& keyPath) {
@@ -787,16 +1131,23 @@ Status Document::CreateKey(const KeyPath& keyPath) {
         return Code::BadDatabase;
     if (FindKey(keyPath) != nullptr)
         return Code::Success;
-    Key expected = root_;
-    EnsureKey(expected, keyPath);
-    std::vector<std::string> raws = Raws();
-    AppendSection(raws, keyPath, std::string());
-    return Commit({raws}, expected);
+    const bool ownBatch = !batch_;
+    BeginBatch();
+    EnsureKey(root_, keyPath).sectionEnd = NewSectionFor(keyPath);
+    if (changedKeyNames_.insert(Fold(JoinPath(keyPath))).second)
+        changedKeys_.push_back(keyPath);
+    return ownBatch ? EndBatch() : Code::Success;
 }
 
 Status Document::DeleteKey(const KeyPath& keyPath) {
     if (!understood_)
         return Code::BadDatabase;
+    if (batch_) {
+        const Status settled = EndBatch();
+        BeginBatch();
+        if (settled != Code::Success)
+            return settled;
+    }
     if (keyPath.empty())
         return Code::AccessDenied;
     const Key* key = FindKey(keyPath);
@@ -814,7 +1165,8 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
     std::vector<bool> drop(lines_.size(), false);
     for (std::size_t i = 0; i < lines_.size(); ++i) {
         const Line& line = lines_[i];
-        if (line.kind != LineKind::Section || !line.currentUser || !IsWithin(line.path, keyPath)) {
+        if (line.kind != LineKind::Section || !line.currentUser ||
+            !IsWithin(Reread(i).path, keyPath)) {
             continue;
         }
         std::size_t last = i;
@@ -832,36 +1184,41 @@ Status Document::DeleteKey(const KeyPath& keyPath) {
         std::fill(drop.begin() + static_cast<std::ptrdiff_t>(i),
                   drop.begin() + static_cast<std::ptrdiff_t>(end), true);
     }
-    std::vector<std::string> removed;
-    const std::vector<std::string> raws = Raws();
-    const std::size_t offset = raws.size() - lines_.size();
-    for (std::size_t i = 0; i < raws.size(); ++i) {
-        if (i < offset || !drop[i - offset])
-            removed.push_back(raws[i]);
+    const std::string header = hasHeader_ ? std::string() : HeaderLine();
+    std::string removed = header;
+    std::size_t removedLast = 0;
+    for (std::size_t i = 0; i < lines_.size(); ++i) {
+        if (!drop[i]) {
+            removedLast = removed.size();
+            removed += Raw(i);
+        }
     }
     // The parent may have existed only through the sections just taken out.
-    std::vector<std::string> withParent = removed;
-    AppendSection(withParent, KeyPath(keyPath.begin(), keyPath.end() - 1), std::string());
+    std::string withParent = removed;
+    AppendSection(withParent, removedLast, KeyPath(keyPath.begin(), keyPath.end() - 1),
+                  std::string(), newline_);
     // Always right, if less tidy: a removal line at the end.
-    std::vector<std::string> removalLine = raws;
-    const std::string newline = Newline();
-    if (!EndsWithNewline(removalLine.back()))
-        removalLine.back() += newline;
-    if (!Trim(Content(removalLine.back())).empty())
-        removalLine.push_back(newline);
-    removalLine.push_back("[-" + std::string(kRootName) + "\\" + JoinPath(keyPath) + "]" + newline);
-    return Commit({removed, withParent, removalLine}, expected);
+    std::string removalLine = header + text_;
+    if (!removalLine.empty() && removalLine.back() != '\n')
+        removalLine += newline_;
+    const std::size_t lastBegin = lines_.empty() ? 0 : header.size() + lines_.back().begin;
+    if (!EndsWithBlankLine(removalLine, std::min(lastBegin, removalLine.size())))
+        removalLine += newline_;
+    removalLine += SectionLine(keyPath, true) + newline_;
+    return Apply({removed, withParent, removalLine}, expected);
 }
 
 std::optional<std::string> Document::Serialize() const {
     if (!understood_)
         return std::nullopt;
-    std::string text;
-    for (const std::string& raw : Raws())
-        text += raw;
-    if (encoding_ == Encoding::Utf8)
-        return (byteOrderMark_ ? "\xEF\xBB\xBF" : "") + text;
-    auto bytes = TextToUtf16Le(text);
+    if (encoding_ == Encoding::Utf8) {
+        std::string bytes = byteOrderMark_ ? std::string("\xEF\xBB\xBF") : std::string();
+        if (!hasHeader_)
+            bytes += HeaderLine();
+        bytes += text_;
+        return bytes;
+    }
+    auto bytes = TextToUtf16Le(hasHeader_ ? text_ : HeaderLine() + text_);
     if (!bytes)
         return std::nullopt;
     return (byteOrderMark_ ? std::string("\xFF\xFE") : std::string()) + *bytes;

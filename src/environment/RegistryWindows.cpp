@@ -3,7 +3,14 @@
 
 #include <windows.h>
 
+#include <cstdlib>
+#include <filesystem>
+#include <memory>
+#include <mutex>
+#include <thread>
+
 #include "environment/RegistryStore.h"
+#include "environment/StoreFile.h"
 
 namespace vtr::RegistryStore {
 namespace {
@@ -98,12 +105,78 @@ class WindowsRegistry final : public Backend {
     Status DeleteSubkey(KeyHandle key, const std::string& subKey) override {
         return RegDeleteKeyA(ToKey(key), subKey.c_str());
     }
+
+    // The registry takes each change as it is made; a group of changes holds the lock file
+    // that every writer of this program takes, so that groups (an ignore list's rewrite,
+    // its count last) never interleave.
+    Status BeginChanges() override {
+        {
+            std::lock_guard lock(mutex_);
+            if (depth_ > 0 && owner_ == std::this_thread::get_id()) {
+                ++depth_;
+                return ERROR_SUCCESS;
+            }
+        }
+        const std::string lockFile = WindowsRegistryLockFile();
+        auto fileLock = std::make_unique<StoreFile::Lock>(lockFile, StoreFile::Lock::On::LockFile);
+        std::lock_guard lock(mutex_);
+        if (!fileLock->Held()) {
+            failure_ = "the registry's lock file " + lockFile + " could not be locked (" +
+                       StoreFile::ErrorText(fileLock->Error()) + ")";
+            return fileLock->Error() != 0 ? fileLock->Error() : ERROR_ACCESS_DENIED;
+        }
+        lock_ = std::move(fileLock);
+        owner_ = std::this_thread::get_id();
+        depth_ = 1;
+        return ERROR_SUCCESS;
+    }
+
+    Status CommitChanges() override {
+        std::lock_guard lock(mutex_);
+        if (depth_ == 0 || owner_ != std::this_thread::get_id())
+            return ERROR_INVALID_HANDLE;
+        if (--depth_ == 0)
+            lock_.reset();
+        return ERROR_SUCCESS;
+    }
+
+    void AbortChanges() override {
+        std::lock_guard lock(mutex_);
+        if (depth_ > 0 && owner_ == std::this_thread::get_id()) {
+            depth_ = 0;
+            lock_.reset();
+        }
+    }
+
+    Condition Examine() override { return Condition{}; }
+
+    std::string Failure() const override {
+        std::lock_guard lock(mutex_);
+        return failure_;
+    }
+
+  private:
+    mutable std::mutex mutex_;
+    std::thread::id owner_;
+    int depth_ = 0;
+    std::unique_ptr<StoreFile::Lock> lock_;
+    std::string failure_;
 };
 
 }  // namespace
 
 std::unique_ptr<Backend> OpenWindowsRegistry() {
     return std::make_unique<WindowsRegistry>();
+}
+
+std::string WindowsRegistryLockFile() {
+    namespace fs = std::filesystem;
+    for (const char* name : {"LOCALAPPDATA", "APPDATA", "TEMP"}) {
+        const char* folder = std::getenv(name);
+        if (folder != nullptr && *folder != '\0')
+            return (fs::path(folder) / "Vantori" / "registry.lock").string();
+    }
+    return "registry.lock";
 }
 
 }  // namespace vtr::RegistryStore

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <system_error>
+#include <vector>
 
 #ifdef _WIN32
 #include <windows.h>
@@ -13,6 +14,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstring>
 #endif
 
 namespace vtr::StoreFile {
@@ -90,24 +92,6 @@ bool IsMissing(DWORD error) {
     return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND;
 }
 
-// A name for the folder's lock that every process of the user derives alike.
-std::string MutexName(const std::string& folder) {
-    std::error_code error;
-    std::string absolute = fs::absolute(folder, error).string();
-    if (error)
-        absolute = folder;
-    uint64_t hash = 1469598103934665603ull;  // FNV-1a
-    for (char c : absolute) {
-        const char lower = (c >= 'A' && c <= 'Z') ? static_cast<char>(c - 'A' + 'a') : c;
-        hash = (hash ^ static_cast<unsigned char>(lower == '/' ? '\\' : lower)) * 1099511628211ull;
-    }
-    char name[64];
-    wsprintfA(name, "Local\\VantoriSettingsStore-%08lx%08lx",
-              static_cast<unsigned long>(hash >> 32),
-              static_cast<unsigned long>(hash & 0xFFFFFFFFu));
-    return name;
-}
-
 }  // namespace
 
 std::optional<Stamp> StampOf(const std::string& path) {
@@ -151,27 +135,68 @@ ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
     return ok ? ReadOutcome::Read : ReadOutcome::Failed;
 }
 
-FolderLock::FolderLock(const std::string& storePath) {
-    const std::string folder = FolderOf(storePath);
-    std::error_code error;
-    fs::create_directories(folder, error);
-    mutex_ = CreateMutexA(nullptr, FALSE, MutexName(folder).c_str());
-    if (mutex_ == nullptr)
+Lock::Lock(const std::string& path, On on) {
+    std::string lockFile = path;
+    if (on == On::StoreFile)
+        lockFile = (fs::path(FolderOf(path)) / ("." + fs::path(path).filename().string() + ".lock"))
+                       .string();
+    std::error_code ignored;
+    fs::create_directories(FolderOf(lockFile), ignored);
+    HANDLE file = CreateFileA(lockFile.c_str(), GENERIC_READ | GENERIC_WRITE,
+                              FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                              OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
+    if (file == INVALID_HANDLE_VALUE) {
+        error_ = static_cast<int>(GetLastError());
         return;
-    const DWORD waited = WaitForSingleObject(static_cast<HANDLE>(mutex_), INFINITE);
-    // An abandoned lock (its holder died) is ours now; the store is whole either way.
-    held_ = waited == WAIT_OBJECT_0 || waited == WAIT_ABANDONED;
+    }
+    if (on == On::StoreFile && GetLastError() != ERROR_ALREADY_EXISTS)
+        SetFileAttributesA(lockFile.c_str(), FILE_ATTRIBUTE_HIDDEN);
+    file_ = file;
+    OVERLAPPED whole = {};
+    held_ = LockFileEx(file, LOCKFILE_EXCLUSIVE_LOCK, 0, MAXDWORD, MAXDWORD, &whole) != 0;
+    if (!held_)
+        error_ = static_cast<int>(GetLastError());
 }
 
-FolderLock::~FolderLock() {
-    if (mutex_ == nullptr)
+Lock::~Lock() {
+    if (file_ == nullptr)
         return;
-    if (held_)
-        ReleaseMutex(static_cast<HANDLE>(mutex_));
-    CloseHandle(static_cast<HANDLE>(mutex_));
+    if (held_) {
+        OVERLAPPED whole = {};
+        UnlockFileEx(static_cast<HANDLE>(file_), 0, MAXDWORD, MAXDWORD, &whole);
+    }
+    CloseHandle(static_cast<HANDLE>(file_));
 }
 
-bool Replace(const std::string& path, const std::string& bytes) {
+std::optional<bool> IsReadOnly(const std::string& path) {
+    const DWORD attributes = GetFileAttributesA(path.c_str());
+    if (attributes == INVALID_FILE_ATTRIBUTES)
+        return IsMissing(GetLastError()) ? std::optional<bool>(false) : std::nullopt;
+    return (attributes & FILE_ATTRIBUTE_READONLY) != 0 &&
+           (attributes & FILE_ATTRIBUTE_DIRECTORY) == 0;
+}
+
+std::string ErrorText(int error) {
+    char* text = nullptr;
+    const DWORD length = FormatMessageA(
+        FORMAT_MESSAGE_ALLOCATE_BUFFER | FORMAT_MESSAGE_FROM_SYSTEM | FORMAT_MESSAGE_IGNORE_INSERTS,
+        nullptr, static_cast<DWORD>(error), 0, reinterpret_cast<LPSTR>(&text), 0, nullptr);
+    std::string out = length > 0 && text != nullptr ? std::string(text, length)
+                                                    : "system error " + std::to_string(error);
+    if (text != nullptr)
+        LocalFree(text);
+    while (!out.empty() &&
+           (out.back() == '\n' || out.back() == '\r' || out.back() == '.' || out.back() == ' '))
+        out.pop_back();
+    return out;
+}
+
+bool Replace(const std::string& path, const std::string& bytes, int* error) {
+    auto fail = [&] {
+        if (error != nullptr)
+            *error = static_cast<int>(GetLastError());
+        return false;
+    };
     RemoveStaleTemporaries(path);
     const std::string folder = FolderOf(path);
     static const char kDigits[] = "0123456789abcdefghijklmnopqrstuvwxyz";
@@ -188,10 +213,10 @@ bool Replace(const std::string& path, const std::string& bytes) {
         file = CreateFileA(temp.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_NEW,
                            FILE_ATTRIBUTE_NORMAL, nullptr);
         if (file == INVALID_HANDLE_VALUE && GetLastError() != ERROR_FILE_EXISTS)
-            return false;
+            return fail();
     }
     if (file == INVALID_HANDLE_VALUE)
-        return false;
+        return fail();
     bool ok = true;
     for (std::size_t done = 0; ok && done < bytes.size();) {
         const DWORD chunk = static_cast<DWORD>(std::min<std::size_t>(bytes.size() - done, 1 << 20));
@@ -200,6 +225,7 @@ bool Replace(const std::string& path, const std::string& bytes) {
         done += written;
     }
     ok = ok && FlushFileBuffers(file);
+    DWORD failure = ok ? 0 : GetLastError();
     ok = CloseHandle(file) && ok;
     // A reader of another program may hold the old file open for a moment.
     for (int attempt = 0; ok; ++attempt) {
@@ -207,12 +233,17 @@ bool Replace(const std::string& path, const std::string& bytes) {
                         MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH)) {
             return true;
         }
-        if (attempt == 20)
+        if (attempt == 20) {
             ok = false;
+            failure = GetLastError();
+        }
         Sleep(50);
     }
+    if (failure == 0)
+        failure = GetLastError();
     DeleteFileA(temp.c_str());
-    return false;
+    SetLastError(failure);
+    return fail();
 }
 
 #else  // POSIX
@@ -289,45 +320,87 @@ ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
     return ok ? ReadOutcome::Read : ReadOutcome::Failed;
 }
 
-FolderLock::FolderLock(const std::string& storePath) {
-    const std::string folder = FolderOf(storePath);
-    std::error_code error;
-    fs::create_directories(folder, error);
-    folder_ = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (folder_ < 0)
+Lock::Lock(const std::string& path, On on) {
+    const std::string folder = FolderOf(path);
+    std::error_code ignored;
+    fs::create_directories(folder, ignored);
+    fd_ = on == On::StoreFile ? ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)
+                              : ::open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+    if (fd_ < 0) {
+        error_ = errno;
         return;
+    }
     int result;
     do {
-        result = ::flock(folder_, LOCK_EX);
+        result = ::flock(fd_, LOCK_EX);
     } while (result != 0 && errno == EINTR);
     held_ = result == 0;
+    if (!held_)
+        error_ = errno;
 }
 
-FolderLock::~FolderLock() {
+Lock::~Lock() {
     // Closing the descriptor releases the lock.
-    if (folder_ >= 0)
-        ::close(folder_);
+    if (fd_ >= 0)
+        ::close(fd_);
 }
 
-bool Replace(const std::string& path, const std::string& bytes) {
+std::optional<bool> IsReadOnly(const std::string& path) {
+    struct stat status;
+    if (::stat(path.c_str(), &status) != 0) {
+        if (errno == ENOENT || errno == ENOTDIR)
+            return false;
+        return std::nullopt;
+    }
+    const uid_t user = ::geteuid();
+    mode_t bit = S_IWOTH;
+    if (user == 0 || user == status.st_uid) {
+        bit = S_IWUSR;
+    } else if (status.st_gid == ::getegid()) {
+        bit = S_IWGRP;
+    } else {
+        const int count = ::getgroups(0, nullptr);
+        std::vector<gid_t> groups(count > 0 ? static_cast<std::size_t>(count) : 0);
+        if (count > 0 && ::getgroups(count, groups.data()) == count &&
+            std::find(groups.begin(), groups.end(), status.st_gid) != groups.end()) {
+            bit = S_IWGRP;
+        }
+    }
+    return (status.st_mode & bit) == 0;
+}
+
+std::string ErrorText(int error) {
+    return std::strerror(error);
+}
+
+bool Replace(const std::string& path, const std::string& bytes, int* error) {
+    auto fail = [&](int number) {
+        if (error != nullptr)
+            *error = number;
+        return false;
+    };
     RemoveStaleTemporaries(path);
     const std::string folder = FolderOf(path);
     std::string temp =
         (fs::path(folder) / (TempPrefix(path) + std::string(kTempUniqueChars, 'X'))).string();
     const int fd = ::mkstemp(temp.data());
     if (fd < 0)
-        return false;
+        return fail(errno);
     ::fcntl(fd, F_SETFD, FD_CLOEXEC);
     // The new version keeps the old one's permissions; a new store is private to the user.
     struct stat old;
     if (::stat(path.c_str(), &old) == 0)
         ::fchmod(fd, old.st_mode & 07777);
     bool ok = WriteFully(fd, bytes) && ::fsync(fd) == 0;
+    int failure = ok ? 0 : errno;
     ok = ::close(fd) == 0 && ok;
-    ok = ok && ::rename(temp.c_str(), path.c_str()) == 0;
+    if (ok && ::rename(temp.c_str(), path.c_str()) != 0)
+        ok = false;
     if (!ok) {
+        if (failure == 0)
+            failure = errno;
         ::unlink(temp.c_str());
-        return false;
+        return fail(failure);
     }
     // Makes the rename itself durable.
     const int directory = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);

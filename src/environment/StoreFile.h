@@ -33,31 +33,50 @@ ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp);
 // The path that a write must replace: the target of a symbolic link, else the path itself.
 std::string WriteTarget(const std::string& path);
 
-// The advisory lock of the stores in one folder, held while the object lives. It locks the
-// folder itself, which is never replaced, so nothing is created for it and nothing is left
-// behind. Creates the folder when it does not exist.
-class FolderLock {
+// The lock that writers of a store hold for the whole of a change (reading the store,
+// changing it, replacing it): a lock of the operating system, which is released when its
+// holder ends however it ends, so nothing has to be cleaned up after a writer that was killed.
+//   - On a store file: on POSIX the store's folder itself is locked (flock), which is never
+//     replaced, so nothing is created for the lock; on Windows a hidden file beside the store,
+//     "." followed by the store file's name and ".lock", is locked (LockFileEx) and stays.
+//   - On a lock file of its own (the Windows registry's writers use one in the user's
+//     profile): that file is locked; it is created, with its folder, when missing.
+// Waits while another process (or another lock object of this one) holds it.
+class Lock {
   public:
-    explicit FolderLock(const std::string& storePath);
-    ~FolderLock();
-    FolderLock(const FolderLock&) = delete;
-    FolderLock& operator=(const FolderLock&) = delete;
+    enum class On { StoreFile, LockFile };
+    Lock(const std::string& path, On on);
+    ~Lock();
+    Lock(const Lock&) = delete;
+    Lock& operator=(const Lock&) = delete;
 
     bool Held() const { return held_; }
+    // The system's error number when the lock could not be taken.
+    int Error() const { return error_; }
 
   private:
     bool held_ = false;
+    int error_ = 0;
 #ifdef _WIN32
-    void* mutex_ = nullptr;
+    void* file_ = nullptr;
 #else
-    int folder_ = -1;
+    int fd_ = -1;
 #endif
 };
 
+// Whether the file's own permissions forbid writing it: on POSIX the write bit of the class
+// the process belongs to (owner, group, others; the superuser counts as the owner, so a file
+// that its owner cannot write is read-only for the superuser too); on Windows the read-only
+// attribute. A missing file is not read-only. Nothing when the file cannot be examined.
+std::optional<bool> IsReadOnly(const std::string& path);
+
 // Replaces the file's content with bytes, so that the file is at every moment either the old
-// or the new version. Only to be called under the store's FolderLock. Temporary files that
-// an interrupted writer left behind are removed first. False (and the old file untouched)
-// on failure.
-bool Replace(const std::string& path, const std::string& bytes);
+// or the new version. Only to be called under the store's Lock. Temporary files that an
+// interrupted writer left behind are removed first. False (and the old file untouched, the
+// system's error number in *error when given) on failure.
+bool Replace(const std::string& path, const std::string& bytes, int* error = nullptr);
+
+// The system's words for an error number of the calls above ("Permission denied").
+std::string ErrorText(int error);
 
 }  // namespace vtr::StoreFile

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <unordered_map>
 
 namespace vtr::seqlib {
 
@@ -20,6 +21,19 @@ class ShellCommandMap {
 
     // The same for a given map file.
     static std::string CommandTextIn(const std::string& mapFile, const std::string& identifier);
+
+    // A map file read once, for any number of questions (a verification reads the map once
+    // and asks it for every sequence that uses shell commands).
+    class Contents {
+      public:
+        // A map that is missing or cannot be read gives no commands.
+        static Contents Read(const std::string& mapFile);
+        // As ShellCommandMap::CommandText, without reading the file again.
+        std::string CommandText(const std::string& identifier) const;
+
+      private:
+        std::unordered_map<std::string, std::string> commands_;  // by identifier
+    };
 };
 
 }  // namespace vtr::seqlib

@@ -46,7 +46,8 @@ ResultDetailsPane::ResultDetailsPane(QWidget* parent) : QFrame(parent) {
     help_ = new QLabel(this);
     help_->setObjectName(QStringLiteral("lblResultHelp"));
     help_->setTextFormat(Qt::RichText);
-    help_->setTextInteractionFlags(Qt::LinksAccessibleByMouse | Qt::LinksAccessibleByKeyboard);
+    // From the keyboard, F1 gives the same help.
+    help_->setTextInteractionFlags(Qt::LinksAccessibleByMouse);
     help_->setText(QStringLiteral("<a href=\"%1\">Help on this result</a>").arg(kHelpLink));
     copy_ = new QPushButton(QStringLiteral("Copy"), this);
     copy_->setObjectName(QStringLiteral("cmdCopyResult"));
@@ -125,6 +126,10 @@ void ResultDetailsPane::ShowResult(const ResultPtr& result, const QIcon& icon,
     if (details.empty())
         html = QStringLiteral("<p><i>This result has no details.</i></p>");
     details_->setHtml(html);
+}
+
+QList<QWidget*> ResultDetailsPane::TabOrder() const {
+    return {copy_, details_};
 }
 
 void ResultDetailsPane::CopyResult() const {

@@ -31,6 +31,9 @@ class ResultDetailsPane : public QFrame {
     void ShowResult(const ResultPtr& result, const QIcon& icon = {}, const QString& ignoredBy = {});
     const ResultPtr& CurrentResult() const { return result_; }
 
+    // The pane's controls that take the keyboard, in reading order.
+    QList<QWidget*> TabOrder() const;
+
     // Puts the result shown on the clipboard as text (nothing when none is shown).
     void CopyResult() const;
 

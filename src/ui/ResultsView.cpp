@@ -7,6 +7,12 @@
 
 namespace vtr {
 
+void MiddleElidingDelegate::initStyleOption(QStyleOptionViewItem* option,
+                                            const QModelIndex& index) const {
+    QStyledItemDelegate::initStyleOption(option, index);
+    option->textElideMode = Qt::ElideMiddle;
+}
+
 ResultsView::ResultsView(ResultsModel* model, QWidget* parent) : QTreeView(parent), model_(model) {
     setModel(model);
     setRootIsDecorated(false);
@@ -15,14 +21,16 @@ ResultsView::ResultsView(ResultsModel* model, QWidget* parent) : QTreeView(paren
     setAllColumnsShowFocus(true);
     setSelectionMode(QAbstractItemView::SingleSelection);
     setSelectionBehavior(QAbstractItemView::SelectRows);
-    setTextElideMode(Qt::ElideMiddle);
     QHeaderView* columns = header();
     columns->setStretchLastSection(false);
     setColumnWidth(ResultsModel::DescriptionColumn, 300);
     setColumnWidth(ResultsModel::SeverityColumn, 80);
     setColumnWidth(ResultsModel::MsgNumColumn, 70);
-    for (int i = 0; i < ResultsModel::kDetailColumns; ++i)
+    auto* details = new MiddleElidingDelegate(this);
+    for (int i = 0; i < ResultsModel::kDetailColumns; ++i) {
         setColumnWidth(ResultsModel::Details1Column + i, 380);
+        setItemDelegateForColumn(ResultsModel::Details1Column + i, details);
+    }
     // The results stay in the order produced until a column header is clicked; a third
     // click on the same header goes back to it.
     columns->setSortIndicatorClearable(true);
@@ -39,6 +47,16 @@ void ResultsView::ShowGroups() {
         return;
     for (int row = 0; row < model_->rowCount(); ++row)
         setFirstColumnSpanned(row, QModelIndex(), true);
+}
+
+void ResultsView::focusInEvent(QFocusEvent* event) {
+    QTreeView::focusInEvent(event);
+    // Reached from the keyboard, the list has a current row: it is the selected one, which
+    // the details pane shows and the keys act on.
+    const QModelIndex current = currentIndex();
+    if (current.isValid() && !selectionModel()->hasSelection())
+        selectionModel()->select(current,
+                                 QItemSelectionModel::ClearAndSelect | QItemSelectionModel::Rows);
 }
 
 void ResultsView::contextMenuEvent(QContextMenuEvent* event) {

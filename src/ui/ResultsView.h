@@ -1,5 +1,6 @@
 #pragma once
 
+#include <QStyledItemDelegate>
 #include <QTreeView>
 
 class QContextMenuEvent;
@@ -8,9 +9,18 @@ namespace vtr {
 
 class ResultsModel;
 
+// Draws a cell's text cut in the middle when it does not fit: a path keeps its file name.
+class MiddleElidingDelegate : public QStyledItemDelegate {
+    Q_OBJECT
+  public:
+    using QStyledItemDelegate::QStyledItemDelegate;
+    void initStyleOption(QStyleOptionViewItem* option, const QModelIndex& index) const override;
+};
+
 // One of the window's result lists: a tree of a ResultsModel, one row per result, or the
-// groups with their results below. Columns are wide and elide in the middle, so that a
-// path keeps its file name in view; each cell's tool tip holds its whole text.
+// groups with their results below. The details' columns are wide and cut their text in the
+// middle, so that a path keeps its file name in view; each cell's tool tip holds its whole
+// text.
 class ResultsView : public QTreeView {
     Q_OBJECT
   public:
@@ -24,6 +34,7 @@ class ResultsView : public QTreeView {
     void PopupRequested(const QModelIndex& index, const QPoint& globalPosition);
 
   protected:
+    void focusInEvent(QFocusEvent* event) override;
     void contextMenuEvent(QContextMenuEvent* event) override;
 
   private:

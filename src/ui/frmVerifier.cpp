@@ -387,6 +387,22 @@ void frmVerifier::BuildControls() {
     setAcceptDrops(true);
     resize(1040, 740);
     ShowSelectedResult();
+    SetTabOrder();
+}
+
+void frmVerifier::SetTabOrder() {
+    // Top to bottom, as the window reads: the target, what to find, the lists, the result
+    // on view, the commands.
+    // (The tabs lead on to the page on view, as they do of themselves.)
+    QList<QWidget*> order{optTargetSequence_, txtTargetSequence_, cmdTargetSequence_,
+                          optTargetShow_,     txtTargetShow_,     cmdTargetShow_,
+                          optTargetSchedule_, txtFilter_,         chkShowErrors_,
+                          chkShowWarnings_,   chkShowInfo_,       chkErrorsFirst_,
+                          cboGroupBy_,        sstDetails_};
+    order += fraResultDetails_->TabOrder();
+    order += {cmdHelp_, cmdSave_, cmdCancel_, cmdVerify_};
+    for (qsizetype i = 1; i < order.size(); ++i)
+        setTabOrder(order[i - 1], order[i]);
 }
 
 ResultsView* frmVerifier::BuildResultList(const QString& name, Listing listing) {

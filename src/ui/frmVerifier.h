@@ -167,6 +167,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // The filter box, the severity toggles, errors first, group by, and "N of M shown".
     QWidget* BuildFindBar(QWidget* parent);
     void BuildMenus();
+    void SetTabOrder();
     void InstallPlatformHooks();
     // The event pump the core calls while a run goes.
     void PumpEvents();

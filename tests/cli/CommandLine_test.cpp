@@ -95,7 +95,7 @@ TEST(CommandLineTest, HelpAndVersionPrintToStandardOutputAndSucceed) {
           "--registry FILE",
           "\nCommands:\n  ignore                  Ignore results in later verifications.\n",
           "\nExamples:\n  vantori-verify --schedule\n", "--group-by pair --statistics\n",
-          "Exit status: 0", "64 for wrong usage"})
+          "Exit status: 0", "130 when the run was cancelled."})
         EXPECT_THAT(out, HasSubstr(text));
     // The parser's own notation stays out of the help.
     for (const char* notation : {"TEXT", "INT", ":{", "Excludes", "NONNEGATIVE", "REQUIRED",

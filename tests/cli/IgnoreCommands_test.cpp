@@ -165,10 +165,10 @@ TEST_F(IgnoreCommandsTest, AStoreThatCannotBeWrittenIsReportedAndLeftAsItWas) {
     Outcome outcome = Run({"ignore", "--message", "23"});
     EXPECT_EQ(outcome.status, 3);
     EXPECT_EQ(outcome.out, "");
-    EXPECT_EQ(outcome.err,
-              "vantori-verify: the ignore list could not be saved in the settings "
-              "store " +
-                  StoreFile() + "\n");
+    EXPECT_EQ(outcome.err, "vantori-verify: the settings store " + StoreFile() +
+                               " is not a registry export (its first line is neither \"Windows "
+                               "Registry Editor Version 5.00\" nor \"REGEDIT4\"); it was left "
+                               "as it is\n");
     EXPECT_EQ(ReadStore(), garbage);
 
     // A store whose folder cannot be made (a file stands in the way).
@@ -176,7 +176,8 @@ TEST_F(IgnoreCommandsTest, AStoreThatCannotBeWrittenIsReportedAndLeftAsItWas) {
     const std::string blocked = folder_.File("blocker") + "/registry.reg";
     outcome = RunMain({"ignore", "--key", "20-", "--registry", blocked});
     EXPECT_EQ(outcome.status, 3);
-    EXPECT_THAT(outcome.err, HasSubstr("could not be saved"));
+    EXPECT_THAT(outcome.err, HasSubstr("could not be written: its folder " +
+                                       folder_.File("blocker") + " could not be made"));
 }
 
 TEST(IgnoreKeyTest, AResultIsMadeWhoseKeyIsTheGivenOne) {

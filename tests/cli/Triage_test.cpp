@@ -415,6 +415,19 @@ TEST_F(TriageTest, ABaselineListsOnlyWhatIsNewAndTakesTheStatusFromIt) {
     EXPECT_EQ(ReadFileBytes(installation_.registryFile), storeBefore);
 }
 
+TEST_F(TriageTest, ABaselineNeverReplacesAFileTheRunRead) {
+    for (const std::string& input : {installation_.weeklyScheduleFile, installation_.registryFile,
+                                     installation_.showFiles[1], installation_.sequenceFiles[0]}) {
+        const std::string before = ReadFileBytes(input);
+        const Outcome outcome = Run({"--write-baseline", input});
+        EXPECT_EQ(outcome.status, 3) << input;
+        EXPECT_EQ(outcome.err, "vantori-verify: Cannot save the baseline as " + input +
+                                   ": this verification read that file; the verifier never "
+                                   "changes the files it verifies. Choose another file.\n");
+        EXPECT_EQ(ReadFileBytes(input), before) << input;
+    }
+}
+
 TEST_F(TriageTest, ABaselineThatCannotBeReadStopsTheRunWithTheReason) {
     const std::string missing = folder_.File("none.json");
     Outcome outcome = Run({"--baseline", missing});

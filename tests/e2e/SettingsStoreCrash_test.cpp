@@ -3,6 +3,9 @@
 // the store, byte for byte: the parts nobody changes exactly as they were and each changed
 // value as one write left it, never part of one. No change that a writer saw succeed is
 // lost, and what killed writers leave behind is cleared by the next write.
+//
+// The results report alike: killed while they save it, writers leave the report of one whole
+// save, and the next save clears what they left beside it.
 
 #include <gtest/gtest.h>
 
@@ -16,6 +19,8 @@
 #include <string>
 #include <vector>
 
+#include "engine/LibVerify.h"
+#include "engine/ResultsReport.h"
 #include "environment/LibRegistry.h"
 #include "environment/RegistryFile.h"
 #include "environment/RegistryStore.h"
@@ -426,6 +431,226 @@ INSTANTIATE_TEST_SUITE_P(Encodings, SettingsStoreCrash,
                              return info.param == Encoding::Utf8 ? std::string("Utf8")
                                                                  : std::string("Utf16");
                          });
+
+// --- The results report ---------------------------------------------------------------------
+
+constexpr int kReportResults = 1500;
+
+// The report that writer saves at generation n: its results carry the writer and generation
+// in their first detail and a line whose length follows from n, so that a report cut short or
+// mixed from two saves is told from a whole one. Written out here as the report's format has
+// it, not through the writer.
+std::string ReportBytes(char writer, int64_t n) {
+    const std::string first = std::string("writer ") + writer + " generation " + std::to_string(n);
+    const std::string padding(40 + static_cast<std::size_t>(n % 7) * 10,
+                              static_cast<char>('a' + n % 26));
+    std::string text;
+    for (int i = 0; i < kReportResults; ++i) {
+        if (i > 0)
+            text += std::string(79, '=') + "\r\n";
+        text +=
+            "Message Number: 5\r\nSeverity: Warning\r\nDescription: Crash report\r\n"
+            "Detail #1: " +
+            first + "\r\nDetail #2: line " + std::to_string(i) + "\r\nDetail #3: " + padding +
+            "\r\n";
+    }
+    return text;
+}
+
+// The writer and generation of a whole report; nothing for anything else.
+std::optional<std::pair<char, int64_t>> ReportVersionOf(const std::string& bytes) {
+    const std::string marker = "Detail #1: writer ";
+    const std::size_t at = bytes.find(marker);
+    if (at == std::string::npos || at + marker.size() + 13 > bytes.size())
+        return std::nullopt;
+    const char writer = bytes[at + marker.size()];
+    const std::size_t number = at + marker.size() + std::string("A generation ").size();
+    const std::size_t end = bytes.find('\r', number);
+    if (end == std::string::npos || end == number || end - number > 9)
+        return std::nullopt;
+    int64_t n = 0;
+    for (std::size_t i = number; i < end; ++i) {
+        if (bytes[i] < '0' || bytes[i] > '9')
+            return std::nullopt;
+        n = n * 10 + (bytes[i] - '0');
+    }
+    if ((writer != 'A' && writer != 'B') || bytes != ReportBytes(writer, n))
+        return std::nullopt;
+    return std::make_pair(writer, n);
+}
+
+class ResultsReportCrash : public testsupport::StoreTest {
+  protected:
+    ResultsReportCrash()
+        : reportFolder_(folder_.File("reports")), report_(reportFolder_ + "/report.txt") {
+        fs::create_directories(reportFolder_);
+        testsupport::WriteFileBytes(report_, ReportBytes('A', 0));
+    }
+
+    // A writer: saves the report of its generations from `from` on, each through the
+    // results report of the driver, and reports each save that succeeded.
+    pid_t StartWriter(char writer, int reportFd, int64_t from, int saves) {
+        return Spawn([&, writer, reportFd, from, saves] {
+            for (int64_t n = from; n < from + saves; ++n) {
+                LibVerify::ClearResults();
+                const std::string first =
+                    std::string("writer ") + writer + " generation " + std::to_string(n);
+                const std::string padding(40 + static_cast<std::size_t>(n % 7) * 10,
+                                          static_cast<char>('a' + n % 26));
+                for (int i = 0; i < kReportResults; ++i) {
+                    LibVerify::AddResult(Severity::Warning, "Crash report", 5, 5,
+                                         {first, "line " + std::to_string(i), padding});
+                }
+                ResultsReport::SaveResultsReport(report_);
+                WriteLine(reportFd, std::to_string(n));
+            }
+            return 0;
+        });
+    }
+
+    // A reader: reads the report afresh until the stop pipe closes; every read must be a
+    // whole report. The outcome goes to the result file, as for the store's readers.
+    pid_t StartReader(const int stop[2], const std::string& resultFile) {
+        const int stopFd = stop[0];
+        const int stopWriteFd = stop[1];
+        return Spawn([&, stopFd, stopWriteFd, resultFile] {
+            ::close(stopWriteFd);
+            const auto deadline = std::chrono::steady_clock::now() + std::chrono::minutes(2);
+            int64_t reads = 0;
+            int64_t changes = 0;
+            std::string last;
+            std::string failure;
+            for (;;) {
+                pollfd stopped{stopFd, POLLIN, 0};
+                if (::poll(&stopped, 1, 0) > 0)
+                    break;
+                if (std::chrono::steady_clock::now() > deadline) {
+                    failure = "never told to stop";
+                    break;
+                }
+                const std::string bytes = ReadAllBytes(report_);
+                if (!ReportVersionOf(bytes)) {
+                    testsupport::WriteFileBytes(resultFile + ".bad", bytes);
+                    failure = "a read that is no whole report (bytes in " + resultFile + ".bad)";
+                    break;
+                }
+                changes += bytes != last ? 1 : 0;
+                last = bytes;
+                ++reads;
+            }
+            testsupport::WriteFileBytes(
+                resultFile, failure.empty()
+                                ? "ok " + std::to_string(reads) + " " + std::to_string(changes)
+                                : failure);
+            return failure.empty() ? 0 : 1;
+        });
+    }
+
+    // The new versions that killed writers left beside the report.
+    std::vector<std::string> LeftBehind() const {
+        std::vector<std::string> names;
+        for (const auto& entry : fs::directory_iterator(reportFolder_)) {
+            const std::string name = entry.path().filename().string();
+            if (name != "report.txt")
+                names.push_back(name);
+        }
+        return names;
+    }
+
+    std::string reportFolder_;
+    std::string report_;
+};
+
+TEST_F(ResultsReportCrash, KilledWritersLeaveAWholeReportAndTheNextSaveClearsTheirLeftovers) {
+    int stop[2];
+    ASSERT_EQ(::pipe(stop), 0);
+    const std::string result = folder_.File("reader.txt");
+    const pid_t reader = StartReader(stop, result);
+    ::close(stop[0]);
+
+    // How long a writer takes to start and save three reports, here and now.
+    int64_t confirmed[2] = {0, 0};
+    std::chrono::microseconds threeSaves{0};
+    {
+        int report[2];
+        ASSERT_EQ(::pipe(report), 0);
+        const auto start = std::chrono::steady_clock::now();
+        const pid_t writer = StartWriter('A', report[1], 1, 3);
+        ::close(report[1]);
+        const int status = WaitFor(writer);
+        threeSaves = std::chrono::duration_cast<std::chrono::microseconds>(
+            std::chrono::steady_clock::now() - start);
+        ASSERT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+        confirmed[0] = LastReported(ReadToEnd(report[0]), 0);
+        ::close(report[0]);
+        ASSERT_EQ(confirmed[0], 3);
+    }
+
+    // Rounds of two writers at once, each killed after its own random time, until kills have
+    // landed in the middle of saves and both writers have finished some.
+    std::mt19937 random(20310315);
+    std::uniform_int_distribution<int64_t> delay(0, 2 * threeSaves.count());
+    int leftBehind = 0;
+    const int64_t before[2] = {confirmed[0], confirmed[1]};
+    auto enough = [&] {
+        return leftBehind > 0 && confirmed[0] > before[0] && confirmed[1] > before[1];
+    };
+    for (int round = 0; round < 120 && (round < 24 || !enough()); ++round) {
+        int reports[2][2];
+        pid_t writers[2];
+        for (int i = 0; i < 2; ++i) {
+            ASSERT_EQ(::pipe(reports[i]), 0);
+            writers[i] = StartWriter(kWriters[i], reports[i][1], confirmed[i] + 1, 1000);
+            ::close(reports[i][1]);
+        }
+        const int64_t first = delay(random);
+        const int64_t second = delay(random);
+        std::this_thread::sleep_for(std::chrono::microseconds(std::min(first, second)));
+        ::kill(writers[first <= second ? 0 : 1], SIGKILL);
+        std::this_thread::sleep_for(std::chrono::microseconds(std::abs(first - second)));
+        ::kill(writers[first <= second ? 1 : 0], SIGKILL);
+        for (int i = 0; i < 2; ++i) {
+            const int status = WaitFor(writers[i]);
+            EXPECT_TRUE(WIFSIGNALED(status) || (WIFEXITED(status) && WEXITSTATUS(status) == 0))
+                << "writer " << kWriters[i] << " in round " << round;
+            // A save that landed but whose writer died before it could tell is one further.
+            confirmed[i] = LastReported(ReadToEnd(reports[i][0]), confirmed[i]);
+            ::close(reports[i][0]);
+        }
+        // The report is one whole save, by one of the writers and not beyond what it did.
+        const auto version = ReportVersionOf(ReadAllBytes(report_));
+        ASSERT_TRUE(version) << "round " << round;
+        const int index = version->first == 'A' ? 0 : 1;
+        EXPECT_LE(version->second, confirmed[index] + 1) << "round " << round;
+        confirmed[index] = std::max(confirmed[index], version->second);
+        leftBehind += static_cast<int>(LeftBehind().size());
+    }
+    EXPECT_TRUE(enough()) << "saves finished: " << confirmed[0] - before[0] << " and "
+                          << confirmed[1] - before[1] << ", kills in a save: " << leftBehind;
+
+    // A save that runs to the end lands, and clears what the killed ones left.
+    {
+        int report[2];
+        ASSERT_EQ(::pipe(report), 0);
+        const pid_t writer = StartWriter('B', report[1], confirmed[1] + 1, 1);
+        ::close(report[1]);
+        const int status = WaitFor(writer);
+        ASSERT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+        EXPECT_EQ(LastReported(ReadToEnd(report[0]), -1), confirmed[1] + 1);
+        ::close(report[0]);
+    }
+    ::close(stop[1]);
+    const int status = WaitFor(reader);
+    const std::string outcome = testsupport::ReadFileBytes(result);
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << outcome;
+    EXPECT_EQ(outcome.rfind("ok ", 0), 0u) << outcome;
+    long long reads = 0, changes = 0;
+    std::sscanf(outcome.c_str(), "ok %lld %lld", &reads, &changes);
+    EXPECT_GT(reads, 10) << outcome;
+    EXPECT_GT(changes, 1) << outcome;
+    EXPECT_EQ(ReportVersionOf(ReadAllBytes(report_)), std::make_pair('B', confirmed[1] + 1));
+    EXPECT_EQ(LeftBehind(), std::vector<std::string>{});
+}
 
 #endif  // !_WIN32
 

@@ -2,8 +2,11 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+
 #include "engine/LibVerify.h"
 #include "environment/LibRegistryVTR.h"
+#include "support/Raised.h"
 #include "support/TempStore.h"
 
 namespace vtr {
@@ -127,6 +130,63 @@ TEST_F(IgnoreListsTest, AStoreThatCannotBeWrittenKeepsTheListsInMemory) {
     EXPECT_NO_THROW(IgnoreLists::UnignoreMessageNumber(12));
     EXPECT_FALSE(IgnoreLists::IsMessageNumberIgnored("12"));
     EXPECT_NO_THROW(IgnoreLists::LoadIgnoreLists());
+}
+
+TEST_F(IgnoreListsTest, AChangeKeepsWhatAnotherWriterStoredMeanwhile) {
+    IgnoreLists::IgnoreMessageNumber(5);
+    Reload();
+    // Another process adds an entry after this one read the lists.
+    SetSuiteString("IgnoreMsgNum2", "7", "Verifier");
+    SetSuiteLong("CountIgnoreMsgNum", 2, "Verifier");
+    IgnoreLists::IgnoreMessageNumber(23);
+    EXPECT_EQ(GetSuiteLong("CountIgnoreMsgNum", "Verifier", -1), 3);
+    EXPECT_EQ(GetSuiteString("IgnoreMsgNum2", "Verifier", ""), "7");
+    EXPECT_EQ(GetSuiteString("IgnoreMsgNum3", "Verifier", ""), "23");
+    // The in-memory list is what the store now holds.
+    EXPECT_EQ(LibVerify::IgnoredMessageNumbers().Entries(),
+              (std::vector<std::string>{"5", "7", "23"}));
+
+    // And removes from the list as stored, not from a stale copy.
+    SetSuiteString("IgnoreMsgNum4", "41", "Verifier");
+    SetSuiteLong("CountIgnoreMsgNum", 4, "Verifier");
+    IgnoreLists::UnignoreMessageNumber(5);
+    EXPECT_EQ(LibVerify::IgnoredMessageNumbers().Entries(),
+              (std::vector<std::string>{"7", "23", "41"}));
+    Reload();
+    EXPECT_EQ(LibVerify::IgnoredMessageNumbers().Entries(),
+              (std::vector<std::string>{"7", "23", "41"}));
+}
+
+TEST_F(IgnoreListsTest, EachChangeSaysWhatItFound) {
+    using IgnoreLists::ChangeOutcome;
+    EXPECT_EQ(IgnoreLists::AddIgnoredMessageNumber(9), ChangeOutcome::Added);
+    EXPECT_EQ(IgnoreLists::AddIgnoredMessageNumber(9), ChangeOutcome::AlreadyListed);
+    EXPECT_EQ(IgnoreLists::RemoveIgnoredMessageNumber(9), ChangeOutcome::Removed);
+    EXPECT_EQ(IgnoreLists::RemoveIgnoredMessageNumber(9), ChangeOutcome::NotListed);
+    EXPECT_EQ(IgnoreLists::AddIgnoredResultKey("28-a / "), ChangeOutcome::Added);
+    EXPECT_EQ(IgnoreLists::AddIgnoredResultKey("28-a / "), ChangeOutcome::AlreadyListed);
+    EXPECT_EQ(IgnoreLists::RemoveIgnoredResultKey("28-b / "), ChangeOutcome::NotListed);
+    EXPECT_EQ(IgnoreLists::RemoveIgnoredResultKey("28-a / "), ChangeOutcome::Removed);
+    EXPECT_EQ(GetSuiteLong("CountIgnoreMsg", "Verifier", -1), 0);
+}
+
+TEST_F(IgnoreListsTest, AStoreThatCannotBeChangedIsReportedAndKeptAsItWas) {
+    IgnoreLists::IgnoreMessageNumber(5);
+    const std::string stored = ReadStore();
+    std::filesystem::permissions(StoreFile(), std::filesystem::perms::owner_read);
+    const auto error = testsupport::Raised([] { IgnoreLists::AddIgnoredMessageNumber(12); });
+    ASSERT_TRUE(error);
+    EXPECT_EQ(error->Description(), "the settings store is read-only: " + StoreFile() +
+                                        " (its permissions do not allow writing; it was left "
+                                        "as it is)");
+    EXPECT_EQ(ReadStore(), stored);
+    EXPECT_EQ(LibVerify::IgnoredMessageNumbers().Entries(), std::vector<std::string>{"5"});
+    EXPECT_TRUE(testsupport::Raised([] { IgnoreLists::RemoveIgnoredMessageNumber(5); }));
+    EXPECT_EQ(LibVerify::IgnoredMessageNumbers().Entries(), std::vector<std::string>{"5"});
+    // The verification's own use goes on in memory.
+    EXPECT_NO_THROW(IgnoreLists::IgnoreMessageNumber(12));
+    EXPECT_TRUE(IgnoreLists::IsMessageNumberIgnored("12"));
+    EXPECT_EQ(ReadStore(), stored);
 }
 
 }  // namespace

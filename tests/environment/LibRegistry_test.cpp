@@ -69,6 +69,11 @@ class RecordingStore : public RegistryStore::Backend {
         calls.push_back("delete " + subKey);
         return inner_->DeleteSubkey(key, subKey);
     }
+    RegistryStore::Status BeginChanges() override { return inner_->BeginChanges(); }
+    RegistryStore::Status CommitChanges() override { return inner_->CommitChanges(); }
+    void AbortChanges() override { inner_->AbortChanges(); }
+    Condition Examine() override { return inner_->Examine(); }
+    std::string Failure() const override { return inner_->Failure(); }
 
     int open = 0;  // handles open now
     std::vector<std::string> calls;

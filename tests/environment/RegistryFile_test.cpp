@@ -320,5 +320,120 @@ TEST(RegistryFile, AStringTheFileCannotHoldIsRefused) {
               Code::InvalidData);
 }
 
+TEST(RegistryFile, ABatchWritesWhatItsChangesWouldOneByOne) {
+    const std::string text =
+        "Windows Registry Editor Version 5.00\r\n"
+        "\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Verifier]\r\n"
+        "\"CountIgnoreMsg\"=dword:00000002\r\n"
+        "\"IgnoreMsg1\"=\"5-a / \"\r\n"
+        "\"IgnoreMsg2\"=\"6-b / \"\r\n"
+        "\r\n"
+        "; the rest is kept as it is\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared]\r\n"
+        "\"AppPath\"=\"C:\\\\Vantori\\\\\"";  // no line end at the very end
+    const KeyPath verifier = SplitKeyPath("Software\\Vantori\\Verifier");
+    const KeyPath shared = SplitKeyPath(kShared);
+    auto change = [&](Document& d) {
+        EXPECT_EQ(d.SetValue(verifier, "IgnoreMsg2", Value::String("7-c / ")), Code::Success);
+        EXPECT_EQ(d.SetValue(verifier, "IgnoreMsg3", Value::String("8-d / ")), Code::Success);
+        EXPECT_EQ(d.SetValue(verifier, "IgnoreMsg4", Value::String("x")), Code::Success);
+        EXPECT_EQ(d.SetValue(verifier, "IgnoreMsg4", Value::String("9-e / ")), Code::Success);
+        EXPECT_EQ(d.SetValue(verifier, "countignoremsg", Value::Dword(4)), Code::Success);
+        EXPECT_EQ(d.SetValue(shared, "UserDataPath", Value::String("D:\\Data")), Code::Success);
+        EXPECT_EQ(d.CreateKey(SplitKeyPath("Software\\Vantori\\Shared\\NetVersion")),
+                  Code::Success);
+        EXPECT_EQ(d.SetValue(SplitKeyPath("Software\\Vantori\\Shared\\NetVersion"), "Ver",
+                             Value::String("{1}")),
+                  Code::Success);
+    };
+    const std::string expected =
+        "Windows Registry Editor Version 5.00\r\n"
+        "\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Verifier]\r\n"
+        "\"CountIgnoreMsg\"=dword:00000004\r\n"
+        "\"IgnoreMsg1\"=\"5-a / \"\r\n"
+        "\"IgnoreMsg2\"=\"7-c / \"\r\n"
+        "\"IgnoreMsg3\"=\"8-d / \"\r\n"
+        "\"IgnoreMsg4\"=\"9-e / \"\r\n"
+        "\r\n"
+        "; the rest is kept as it is\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared]\r\n"
+        "\"AppPath\"=\"C:\\\\Vantori\\\\\"\r\n"
+        "\"UserDataPath\"=\"D:\\\\Data\"\r\n"
+        "\r\n"
+        "[HKEY_CURRENT_USER\\Software\\Vantori\\Shared\\NetVersion]\r\n"
+        "\"Ver\"=\"{1}\"\r\n";
+    for (const std::string& bytes : {text, Utf16(text)}) {
+        Document batch = Document::Parse(bytes);
+        batch.BeginBatch();
+        change(batch);
+        // Queries see the changes at once; the text gets them at the end of the batch.
+        EXPECT_EQ(Text(batch, "Software\\Vantori\\Verifier", "IgnoreMsg4"), "9-e / ");
+        EXPECT_EQ(*batch.Serialize(), bytes);
+        EXPECT_EQ(batch.EndBatch(), Code::Success);
+        EXPECT_TRUE(batch.Modified());
+        EXPECT_EQ(*batch.Serialize(), bytes == text ? expected : Utf16(expected));
+
+        Document single = Document::Parse(bytes);
+        change(single);
+        EXPECT_EQ(single.Serialize(), batch.Serialize());
+        // The next batch finds its lines where the last one left them.
+        batch.BeginBatch();
+        EXPECT_EQ(batch.SetValue(verifier, "IgnoreMsg5", Value::String("10-f / ")), Code::Success);
+        EXPECT_EQ(batch.SetValue(verifier, "IgnoreMsg1", Value::String("4-z / ")), Code::Success);
+        EXPECT_EQ(batch.EndBatch(), Code::Success);
+        std::string next = expected;
+        next.replace(next.find("5-a / "), 6, "4-z / ");
+        const std::string fourth = "\"IgnoreMsg4\"=\"9-e / \"\r\n";
+        next.insert(next.find(fourth) + fourth.size(), "\"IgnoreMsg5\"=\"10-f / \"\r\n");
+        EXPECT_EQ(*batch.Serialize(), bytes == text ? next : Utf16(next));
+    }
+}
+
+TEST(RegistryFile, ABatchWithAChangeTheFileCannotHoldIsUndoneWhole) {
+    const std::string text =
+        "Windows Registry Editor Version 5.00\n\n[HKCU\\K]\n\"A\"=\"1\"\n\"B\"=dword:00000002\n";
+    Document document = Document::Parse(text);
+    document.BeginBatch();
+    EXPECT_EQ(document.SetValue({"K"}, "A", Value::String("changed")), Code::Success);
+    EXPECT_EQ(document.CreateKey({"K", "Sub"}), Code::Success);
+    EXPECT_EQ(document.SetValue({"K"}, "two\nlines", Value::Dword(1)), Code::Success);
+    EXPECT_EQ(document.EndBatch(), Code::InvalidData);
+    EXPECT_FALSE(document.Modified());
+    EXPECT_EQ(*document.Serialize(), text);
+    EXPECT_EQ(Text(document, "K", "A"), "1");
+    EXPECT_EQ(document.FindKey({"K", "Sub"}), nullptr);
+    // The document goes on as it was.
+    EXPECT_EQ(document.SetValue({"K"}, "A", Value::String("2")), Code::Success);
+    EXPECT_EQ(*document.Serialize(),
+              "Windows Registry Editor Version 5.00\n\n[HKCU\\K]\n\"A\"=\"2\"\n"
+              "\"B\"=dword:00000002\n");
+}
+
+TEST(RegistryFile, ValuesThatCannotJoinTheirSectionGetASectionAtTheEnd) {
+    // The section ends with a line continued past the end of the file: a line added after it
+    // would be read as part of it.
+    const std::string text =
+        "Windows Registry Editor Version 5.00\n\n[HKCU\\K]\n\"Old\"=\"1\"\n\"x\" junk \\\n";
+    Document document = Document::Parse(text);
+    document.BeginBatch();
+    EXPECT_EQ(document.SetValue({"K"}, "A", Value::String("a")), Code::Success);
+    EXPECT_EQ(document.SetValue({"K"}, "B", Value::Dword(2)), Code::Success);
+    EXPECT_EQ(document.EndBatch(), Code::Success);
+    EXPECT_EQ(*document.Serialize(), text +
+                                         "\n[HKEY_CURRENT_USER\\K]\n\"A\"=\"a\"\n"
+                                         "\"B\"=dword:00000002\n");
+    const Document reread = Document::Parse(*document.Serialize());
+    EXPECT_EQ(Text(reread, "K", "A"), "a");
+    EXPECT_EQ(*Find(reread, "K", "B"), Value::Dword(2));
+    EXPECT_EQ(Text(reread, "K", "Old"), "1");
+    // Later changes land in the new section.
+    EXPECT_EQ(document.SetValue({"K"}, "C", Value::String("c")), Code::Success);
+    EXPECT_EQ(*document.Serialize(), text +
+                                         "\n[HKEY_CURRENT_USER\\K]\n\"A\"=\"a\"\n"
+                                         "\"B\"=dword:00000002\n\"C\"=\"c\"\n");
+}
+
 }  // namespace
 }  // namespace vtr::RegistryFile

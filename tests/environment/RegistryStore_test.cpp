@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <filesystem>
 #include <random>
 #include <thread>
@@ -10,6 +11,7 @@
 #include "engine/VtrError.h"
 #include "environment/LibRegistryVTRShared.h"
 #include "environment/RegistryFile.h"
+#include "support/Raised.h"
 #include "support/TempStore.h"
 
 #ifndef _WIN32
@@ -133,6 +135,121 @@ TEST_F(RegistryStoreTest, ReadsSeeChangesMadeByOthersAndNeverFail) {
     EXPECT_TRUE(fs::is_directory(StoreFile()));
 }
 
+TEST_F(RegistryStoreTest, AGroupOfChangesIsWrittenOnceAtCommitAndNotAtAllWithoutIt) {
+    const std::string original = BulkStore(3);
+    WriteStore(original);
+    {
+        RegistryStore::Changes changes;
+        SetSharedString("A", "1", "");
+        SetSharedString("B", "2", "Group");
+        // This thread sees its changes; the file and the other threads do not, yet.
+        EXPECT_EQ(GetSharedString("A", "", "none"), "1");
+        EXPECT_EQ(ReadStore(), original);
+        std::string seenElsewhere;
+        std::thread([&] { seenElsewhere = GetSharedString("A", "", "none"); }).join();
+        EXPECT_EQ(seenElsewhere, "none");
+        changes.Commit();
+    }
+    EXPECT_EQ(ReadStore(), original +
+                               "\r\n[HKEY_CURRENT_USER\\Software\\Vantori\\Shared]\r\n"
+                               "\"A\"=\"1\"\r\n"
+                               "\r\n[HKEY_CURRENT_USER\\Software\\Vantori\\Shared\\Group]\r\n"
+                               "\"B\"=\"2\"\r\n");
+    const std::string committed = ReadStore();
+    {
+        RegistryStore::Changes changes;
+        SetSharedString("A", "changed", "");
+        // An error on the way: the changes are never committed.
+    }
+    EXPECT_EQ(ReadStore(), committed);
+    EXPECT_EQ(GetSharedString("A", "", "none"), "1");
+    EXPECT_TRUE(Leftovers(folder_.Path(), "registry.reg").empty());
+}
+
+TEST_F(RegistryStoreTest, AReadOnlyStoreFileIsRefusedAndLeftAsItIs) {
+    const std::string original = BulkStore(2);
+    WriteStore(original);
+    const auto readOnly = fs::perms::owner_read | fs::perms::group_read | fs::perms::others_read;
+    fs::permissions(StoreFile(), readOnly);
+    // Judged by the file's own permissions, so it holds for the superuser too.
+    const std::string expected = "the settings store is read-only: " + StoreFile() +
+                                 " (its permissions do not allow writing; it was left as it is)";
+    EXPECT_EQ(testsupport::RaisedDescription([] { RegistryStore::Changes changes; }), expected);
+    EXPECT_THROW(SetSharedString("AppPath", "/x", ""), VtrError);
+    EXPECT_EQ(RegistryStore::Current().Failure(), expected);
+    EXPECT_EQ(ReadStore(), original);
+    EXPECT_EQ(fs::status(StoreFile()).permissions() & fs::perms::all, readOnly);
+    EXPECT_TRUE(RegistryStore::Describe().condition.readOnly);
+    EXPECT_TRUE(Leftovers(folder_.Path(), "registry.reg").empty());
+
+    // Writable for its owner only: not read-only.
+    fs::permissions(StoreFile(), fs::perms::owner_read | fs::perms::owner_write);
+    SetSharedString("AppPath", "/x", "");
+    EXPECT_EQ(GetSharedString("AppPath", "", ""), "/x");
+    EXPECT_FALSE(RegistryStore::Describe().condition.readOnly);
+}
+
+TEST_F(RegistryStoreTest, TheDescriptionSaysWhichStoreHowItWasChosenAndWhatIsWrong) {
+    testsupport::ScopedStore restore(RegistryStore::OpenFileStore(StoreFile()));
+    testsupport::ScopedEnvironment named("VANTORI_REGISTRY", StoreFile());
+    RegistryStore::Select(std::nullopt);
+    RegistryStore::Description description = RegistryStore::Describe();
+    EXPECT_EQ(description.file, StoreFile());
+    EXPECT_EQ(description.OriginWord(), "environment");
+    EXPECT_FALSE(description.condition.exists);
+    EXPECT_EQ(description.Problem(),
+              "the settings store " + StoreFile() +
+                  " (named by VANTORI_REGISTRY) does not exist; verifying with no settings. "
+                  "Name the suite's exported settings with --registry FILE or the environment "
+                  "variable VANTORI_REGISTRY.");
+
+    WriteStore("notes, not settings\n");
+    RegistryStore::Select(StoreFile());
+    description = RegistryStore::Describe();
+    EXPECT_EQ(description.OriginWord(), "option");
+    EXPECT_TRUE(description.condition.exists);
+    EXPECT_FALSE(description.condition.understood);
+    EXPECT_EQ(description.Problem(),
+              "the settings store " + StoreFile() +
+                  " (named with --registry) exists but could not be read as a registry export "
+                  "(its first line is neither \"Windows Registry Editor Version 5.00\" nor "
+                  "\"REGEDIT4\"); verifying with no settings. Export the suite's settings again, "
+                  "or name another file with --registry FILE or VANTORI_REGISTRY.");
+
+    WriteStore("REGEDIT4\n");
+    EXPECT_EQ(RegistryStore::Describe().Problem(), "");
+#ifndef _WIN32
+    testsupport::ScopedEnvironment noStore("VANTORI_REGISTRY", std::nullopt);
+    testsupport::ScopedEnvironment config("XDG_CONFIG_HOME", folder_.File("config"));
+    RegistryStore::Select(std::nullopt);
+    description = RegistryStore::Describe();
+    EXPECT_EQ(description.OriginWord(), "default");
+    EXPECT_THAT(
+        description.Problem(),
+        ::testing::StartsWith("the settings store " + folder_.File("config/vantori/registry.reg") +
+                              " (the per-user default, as neither --registry nor "
+                              "VANTORI_REGISTRY names one) does not exist"));
+#endif
+}
+
+TEST_F(RegistryStoreTest, AReadScopeLooksAtTheStoreOnce) {
+    WriteStore("REGEDIT4\n\n[HKCU\\Software\\Vantori\\Shared]\n\"A\"=\"1\"\n");
+    {
+        RegistryStore::ReadScope reading;
+        EXPECT_EQ(GetSharedString("A", "", ""), "1");
+        // Another program changes the file: not seen until the scope ends.
+        WriteStore("REGEDIT4\n\n[HKCU\\Software\\Vantori\\Shared]\n\"A\"=\"2, longer\"\n");
+        EXPECT_EQ(GetSharedString("A", "", ""), "1");
+        // What this process writes is seen at once.
+        SetSharedString("B", "mine", "");
+        EXPECT_EQ(GetSharedString("B", "", ""), "mine");
+        EXPECT_EQ(GetSharedString("A", "", ""), "2, longer");
+    }
+    WriteStore("REGEDIT4\n\n[HKCU\\Software\\Vantori\\Shared]\n\"A\"=\"3\"\n");
+    RegistryStore::ReadScope again;
+    EXPECT_EQ(GetSharedString("A", "", ""), "3");
+}
+
 #ifndef _WIN32
 
 TEST_F(RegistryStoreTest, AWriteKeepsTheFilesPermissionsAndALinkToIt) {
@@ -184,6 +301,41 @@ TEST_F(RegistryStoreTest, TwoProcessesWritingAtOnceBothLandTheirChanges) {
     EXPECT_EQ(GetSharedString("Adapter", "Network\\DMX39", ""), "adapter 39");
     EXPECT_THAT(ReadStore(), HasSubstr("\"Kept\"=\"yes\""));
     EXPECT_TRUE(Leftovers(folder_.Path(), "registry.reg").empty());
+}
+
+TEST_F(RegistryStoreTest, AnotherProcessWaitsWhileAGroupOfChangesIsMade) {
+    WriteStore(BulkStore(2));
+    int go[2];
+    int started[2];
+    ASSERT_EQ(::pipe(go), 0);
+    ASSERT_EQ(::pipe(started), 0);
+    const pid_t child = ::fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+        char byte;
+        if (::read(go[0], &byte, 1) != 1)
+            ::_exit(2);
+        (void)!::write(started[1], "x", 1);
+        const bool written = ResumeStep([] { SetSharedString("Second", "child", ""); });
+        ::_exit(written ? 0 : 1);
+    }
+    {
+        RegistryStore::Changes changes;
+        SetSharedString("First", "parent", "");
+        ASSERT_EQ(::write(go[1], "x", 1), 1);
+        char byte;
+        ASSERT_EQ(::read(started[0], &byte, 1), 1);
+        std::this_thread::sleep_for(std::chrono::milliseconds(300));
+        EXPECT_EQ(ReadStore(), BulkStore(2)) << "the other writer waits for the lock";
+        changes.Commit();
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+    EXPECT_EQ(GetSharedString("First", "", ""), "parent");
+    EXPECT_EQ(GetSharedString("Second", "", ""), "child");
+    for (int fd : {go[0], go[1], started[0], started[1]})
+        ::close(fd);
 }
 
 TEST_F(RegistryStoreTest, AWriterKilledAtAnyMomentLeavesTheOldOrTheNewStore) {

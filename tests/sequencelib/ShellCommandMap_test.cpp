@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "engine/LibVerify.h"
 #include "environment/LibRegistryVTRShared.h"
 #include "support/TempStore.h"
 
@@ -62,6 +63,19 @@ TEST_F(ShellCommandMapTest, ReadsTheMapAgainOnEveryCall) {
     EXPECT_EQ(map.CommandText("1"), "first");
     WriteMap("((1,changed))");
     EXPECT_EQ(map.CommandText("1"), "changed");
+}
+
+TEST_F(ShellCommandMapTest, AVerificationReadsTheMapOncePerRun) {
+    WriteMap("((1,first),(2,second))");
+    LibVerify::RunVerification();
+    EXPECT_EQ(LibVerify::ShellCommandText("1"), "first");
+    WriteMap("((1,changed))");
+    EXPECT_EQ(LibVerify::ShellCommandText("2"), "second") << "the map as the run first read it";
+    // The next run reads it again.
+    LibVerify::RunVerification();
+    EXPECT_EQ(LibVerify::ShellCommandText("1"), "changed");
+    EXPECT_EQ(LibVerify::ShellCommandText("2"), "");
+    LibVerify::ClearResults();
 }
 
 }  // namespace

@@ -147,6 +147,27 @@ TEST_F(InstallationGeneratorTest, AVerificationOfACleanInstallationFindsOnlyItsC
     EXPECT_EQ(LibVerify::ErrorCount(), 0);
 }
 
+TEST_F(InstallationGeneratorTest, AFolderNamedRelativelyIsWrittenWithAbsolutePaths) {
+    const fs::path previous = fs::current_path();
+    fs::current_path(folder.Path());
+    const auto installation = gen::MakeInstallation("./made/../inst", SmallOptions());
+    fs::current_path(previous);
+
+    const std::string root = folder.File("inst") + static_cast<char>(fs::path::preferred_separator);
+    EXPECT_EQ(installation.root, root);
+    EXPECT_EQ(installation.registryFile, root + "registry.reg");
+    EXPECT_THAT(ReadFileBytes(installation.registryFile),
+                HasSubstr("\"UserDataPath\"=" +
+                          testsupport::RegText(root + "data" +
+                                               static_cast<char>(fs::path::preferred_separator))));
+    const auto schedule = ScheduleFunctions::LoadSchedule(installation.weeklyScheduleFile);
+    EXPECT_EQ(schedule->FirstShowEvent()->Filename(), installation.showFiles[0]);
+    EXPECT_EQ(installation.showFiles[0].rfind(root, 0), 0u);
+    // Verified from another folder than the one it was made in, it finds what it always does.
+    VerifyEntireSchedule(installation);
+    EXPECT_EQ(MessageNumbers(), (std::set<int32_t>{6, 30, 43}));
+}
+
 TEST_F(InstallationGeneratorTest, AVerificationFindsEveryFaultAndGoesOn) {
     auto options = SmallOptions();
     options.faults = true;

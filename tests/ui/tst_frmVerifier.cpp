@@ -18,6 +18,7 @@
 #include <QScopeGuard>
 #include <QSettings>
 #include <QSignalSpy>
+#include <QTabBar>
 #include <QTabWidget>
 #include <QTextBlock>
 #include <QTextBrowser>
@@ -31,6 +32,7 @@
 
 #include "ChmWriter.h"
 #include "HelpViewer.h"
+#include "ResultsView.h"
 #include "UiTestMain.h"
 #include "VtrVersion.h"
 #include "engine/IgnoreLists.h"
@@ -1003,6 +1005,22 @@ void FrmVerifierTest::keyboardReachesTheCommands() {
     auto* menu = Find<QMenu>("mnuResultPopup");
     QTRY_VERIFY(menu->isVisible());
     menu->hide();
+
+    // Tab goes down the window: from the grouping (Alt+G) to the tabs, the list on view, and
+    // the result shown in the details pane (its Copy, its details).
+    QTest::keyClick(window_.get(), Qt::Key_G, Qt::AltModifier);
+    QCOMPARE(QApplication::focusWidget(), Find<QComboBox>("cboGroupBy"));
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QVERIFY(qobject_cast<QTabBar*>(QApplication::focusWidget()) != nullptr);
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QCOMPARE(QApplication::focusWidget(), static_cast<QWidget*>(Results()));
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QCOMPARE(QApplication::focusWidget(), Find<QPushButton>("cmdCopyResult"));
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QCOMPARE(QApplication::focusWidget(), Find<QTextBrowser>("txtResultDetails"));
+    // Alt+F: the filter.
+    QTest::keyClick(window_.get(), Qt::Key_F, Qt::AltModifier);
+    QCOMPARE(QApplication::focusWidget(), Find<QLineEdit>("txtFilter"));
 }
 
 void FrmVerifierTest::popupActsOnTheRowUnderThePointer() {
@@ -1736,13 +1754,31 @@ void FrmVerifierTest::detailColumnsShowFileNames() {
     QTreeView* list = Results();
     // Wide columns that keep a path's ends, its file name among them, and tell the rest in
     // the tool tip.
-    QVERIFY(list->columnWidth(frmVerifier::Details1Column) >= 380);
-    QCOMPARE(list->textElideMode(), Qt::ElideMiddle);
     const QModelIndex detail = ItemOf(list, result).siblingAtColumn(frmVerifier::Details1Column);
+    for (int column = frmVerifier::Details1Column; column < frmVerifier::Details1Column + 9;
+         ++column) {
+        QVERIFY(list->columnWidth(column) >= 380);
+        auto* delegate =
+            qobject_cast<vtr::MiddleElidingDelegate*>(list->itemDelegateForColumn(column));
+        QVERIFY(delegate != nullptr);
+        QStyleOptionViewItem option;
+        delegate->initStyleOption(&option, detail);
+        QCOMPARE(option.textElideMode, Qt::ElideMiddle);
+    }
+    // A description is cut at its end, as text is.
+    QCOMPARE(list->textElideMode(), Qt::ElideRight);
     QCOMPARE(detail.data(Qt::ToolTipRole).toString(),
              QString::fromStdString("[SEQUENCE]: " + path));
     QCOMPARE(ItemOf(list, result).data(Qt::ToolTipRole).toString(),
              QString::fromStdString("Channel is missing settings\n[SEQUENCE]: " + path));
+    // Reached from the keyboard, the list's first result is the selected one, shown whole.
+    QTest::keyClick(window_.get(), Qt::Key_G, Qt::AltModifier);
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+    QCOMPARE(QApplication::focusWidget(), static_cast<QWidget*>(list));
+    QVERIFY(list->selectionModel()->isRowSelected(0, QModelIndex()));
+    QCOMPARE(Find<QTextBrowser>("txtResultDetails")->toPlainText(),
+             QString::fromStdString("[SEQUENCE]: " + path));
 }
 
 VTR_UI_TEST_MAIN(FrmVerifierTest)

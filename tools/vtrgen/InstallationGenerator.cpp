@@ -50,15 +50,27 @@ WeekTimePtr WeekTimeAt(int32_t seconds) {
     return time;
 }
 
+// The settings, schedules and shows name everything by absolute path, so that the
+// installation verifies the same from any folder.
+fs::path AbsoluteFolder(const std::string& root) {
+    std::error_code error;
+    const fs::path absolute = fs::absolute(fs::path(root), error);
+    if (error)
+        Raise(ErrorNumbers::UserMessage, kSource,
+              "Cannot find the folder \"" + root + "\": " + error.message());
+    return absolute.lexically_normal();
+}
+
 class Writer {
   public:
-    Writer(const std::string& root, const InstallationOptions& options) : options_(options) {
-        installation_.root = WithSeparator(fs::path(root));
+    Writer(const std::string& rootName, const InstallationOptions& options) : options_(options) {
+        const fs::path root = AbsoluteFolder(rootName);
+        installation_.root = WithSeparator(root);
         installation_.registryFile = installation_.root + "registry.reg";
-        installation_.appFolder = WithSeparator(fs::path(root) / "app");
-        installation_.userDataFolder = WithSeparator(fs::path(root) / "data");
-        installation_.nonMediaFolder = WithSeparator(fs::path(root) / "data" / "sequences");
-        installation_.mediaFolder = WithSeparator(fs::path(root) / "data" / "media");
+        installation_.appFolder = WithSeparator(root / "app");
+        installation_.userDataFolder = WithSeparator(root / "data");
+        installation_.nonMediaFolder = WithSeparator(root / "data" / "sequences");
+        installation_.mediaFolder = WithSeparator(root / "data" / "media");
         installation_.weeklyScheduleFile = installation_.userDataFolder + "weeksched.lsc";
         installation_.yearlyScheduleFile = installation_.userDataFolder + "yearsched.lsc";
         for (const std::string& folder :

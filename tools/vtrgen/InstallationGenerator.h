@@ -83,8 +83,9 @@ struct Installation {
     std::int64_t events = 0;
 };
 
-// Writes the installation below `root` (created when missing; files of an earlier
-// installation there are replaced). Raises VtrError when a file cannot be written.
+// Writes the installation below `root`, created when missing (files of an earlier installation
+// there are replaced). Every path it writes is absolute, however `root` is given. Raises
+// VtrError when a file cannot be written.
 Installation MakeInstallation(const std::string& root, const InstallationOptions& options);
 
 // The settings store text of an installation in those folders (the format of a registry
