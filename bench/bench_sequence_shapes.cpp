@@ -28,7 +28,7 @@
 #include <string>
 #include <vector>
 
-#include "support/ChildRun.h"
+#include "support/ChildProcess.h"
 #include "support/SequenceBenchSupport.h"
 
 namespace {

@@ -43,7 +43,7 @@
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
-#include "support/ChildRun.h"
+#include "support/ChildProcess.h"
 #include "support/PeImage.h"
 #include "support/SequenceBenchSupport.h"
 #include "vtrgen/InstallationGenerator.h"

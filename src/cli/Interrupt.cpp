@@ -20,16 +20,31 @@ volatile std::sig_atomic_t requested = 0;
 
 #ifdef _WIN32
 
+// The first Ctrl-C asks for a cancellation; the second removes the temporary files and ends
+// the program at once.
+void OnCtrlC() {
+    if (requested != 0) {
+        LibFile::RemoveRegisteredTempFiles();
+        ExitProcess(130);
+    }
+    requested = static_cast<int>(Interruption::CtrlC);
+}
+
+// SIGINT raised inside the program (the C library resets the handler at each delivery).
+extern "C" void OnSignal(int signalNumber) {
+    std::signal(signalNumber, OnSignal);
+    OnCtrlC();
+}
+
+using SignalHandler = void (*)(int);
+SignalHandler previousInterrupt = SIG_DFL;
+
 // Runs on a thread of its own that the system starts for each event.
 BOOL WINAPI OnConsoleEvent(DWORD event) {
     switch (event) {
         case CTRL_C_EVENT:
         case CTRL_BREAK_EVENT:
-            if (requested != 0) {
-                LibFile::RemoveRegisteredTempFiles();
-                ExitProcess(130);
-            }
-            requested = static_cast<int>(Interruption::CtrlC);
+            OnCtrlC();
             return TRUE;
         case CTRL_CLOSE_EVENT:
         case CTRL_LOGOFF_EVENT:
@@ -95,6 +110,7 @@ extern "C" void OnSignal(int signalNumber) {
 InterruptGuard::InterruptGuard() {
     requested = 0;
 #ifdef _WIN32
+    previousInterrupt = std::signal(SIGINT, OnSignal);
     SetConsoleCtrlHandler(OnConsoleEvent, TRUE);
 #else
     outputClosed = 0;
@@ -113,6 +129,7 @@ InterruptGuard::InterruptGuard() {
 InterruptGuard::~InterruptGuard() {
 #ifdef _WIN32
     SetConsoleCtrlHandler(OnConsoleEvent, FALSE);
+    std::signal(SIGINT, previousInterrupt == SIG_ERR ? SIG_DFL : previousInterrupt);
 #else
     for (std::size_t i = 0; i < sizeof kHandled / sizeof kHandled[0]; ++i) {
         if (kHandled[i] == SIGPIPE && outputClosed != 0)

@@ -15,8 +15,9 @@ enum class Interruption { None, CtrlC, Terminate, HangUp, OutputClosed };
 // process as usual. SIGPIPE counts once; after it, writes fail quietly instead, and stay so
 // when the guard ends, since the output is gone.
 //
-// On Windows the console's control handler does the same for Ctrl-C and Ctrl-Break; the
-// console closing, a log-off or a shutdown removes the temporary files and ends at once.
+// On Windows the console's control handler (and a SIGINT handler, for SIGINT raised inside
+// the program) does the same for Ctrl-C and Ctrl-Break; the console closing, a log-off or a
+// shutdown removes the temporary files and ends at once.
 //
 // The handlers that were in place come back when the guard ends.
 class InterruptGuard {

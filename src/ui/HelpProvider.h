@@ -4,6 +4,8 @@
 #include <memory>
 #include <string>
 
+#include "environment/FilesRead.h"
+
 class QWidget;
 
 namespace vtr {
@@ -13,8 +15,12 @@ namespace vtr {
 class HelpProvider {
   public:
     virtual ~HelpProvider() = default;
-    // Remembers the help file (its full path); nothing is opened yet.
-    void Prepare(const std::string& helpFile) { helpFile_ = helpFile; }
+    // Remembers the help file (its full path); nothing is opened yet. A file of the suite
+    // the window reads: no report is ever saved over it (FilesRead).
+    void Prepare(const std::string& helpFile) {
+        helpFile_ = helpFile;
+        FilesRead::RecordProgramFile(helpFile);
+    }
     const std::string& HelpFile() const { return helpFile_; }
     // Shows the topic of a help-context id; a file without that id shows the verifier's own
     // page. Raises VtrError when the help file cannot be opened or shown.

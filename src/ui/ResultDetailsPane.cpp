@@ -132,6 +132,14 @@ QList<QWidget*> ResultDetailsPane::TabOrder() const {
     return {copy_, details_};
 }
 
+void ResultDetailsPane::ShowGroup(const QString& title, const QIcon& icon, const QString& counts) {
+    ShowResult(nullptr);
+    icon_->setPixmap(icon.isNull() ? QPixmap() : icon.pixmap(16, 16));
+    summary_->setText(title);
+    kind_->setText(counts);
+    details_->setHtml(QStringLiteral("<p><i>Open the group to see its results.</i></p>"));
+}
+
 void ResultDetailsPane::CopyResult() const {
     if (result_)
         QApplication::clipboard()->setText(ResultText(*result_));

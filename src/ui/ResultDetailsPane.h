@@ -29,6 +29,8 @@ class ResultDetailsPane : public QFrame {
     // Shows a result (nothing: the pane says how to pick one). icon is its severity's image;
     // ignoredBy says why an ignored result is ignored ("" for one that is not).
     void ShowResult(const ResultPtr& result, const QIcon& icon = {}, const QString& ignoredBy = {});
+    // Shows a group's row: its title and what it holds.
+    void ShowGroup(const QString& title, const QIcon& icon, const QString& counts);
     const ResultPtr& CurrentResult() const { return result_; }
 
     // The pane's controls that take the keyboard, in reading order.

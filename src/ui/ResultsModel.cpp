@@ -21,8 +21,9 @@ QString CountText(int64_t count, const char* one, const char* many) {
         .arg(QLatin1String(count == 1 ? one : many));
 }
 
-// "2 errors, 1 warning": what a group holds, for its tool tip.
-QString CountsText(const SeverityCounts& counts) {
+}  // namespace
+
+QString ResultsModel::CountsText(const SeverityCounts& counts) {
     QStringList parts;
     if (counts.errors > 0)
         parts.append(CountText(counts.errors, "error", "errors"));
@@ -34,8 +35,6 @@ QString CountsText(const SeverityCounts& counts) {
         parts.append(CountText(counts.other, "other result", "other results"));
     return parts.join(QStringLiteral(", "));
 }
-
-}  // namespace
 
 ResultsModel::ResultsModel(const ResultGrouping& grouping, Listing listing, IconOf iconOf,
                            QObject* parent)

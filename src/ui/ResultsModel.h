@@ -65,6 +65,8 @@ class ResultsModel : public QAbstractItemModel {
     // The group of a group row; nullptr for anything else.
     const ResultGroup* GroupAt(const QModelIndex& index) const;
     bool IsGrouped() const { return query_.groupBy != GroupBy::None; }
+    // What a group holds: "2 errors, 1 warning".
+    static QString CountsText(const SeverityCounts& counts);
 
     // QAbstractItemModel.
     QModelIndex index(int row, int column, const QModelIndex& parent = {}) const override;

@@ -98,6 +98,13 @@ QString AbsoluteTarget(const QString& path) {
         QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
 }
 
+// Whether two queries show a listing alike: the same filter, order and grouping.
+bool SameView(const ResultQuery& a, const ResultQuery& b) {
+    return a.filter.text == b.filter.text && a.filter.errors == b.filter.errors &&
+           a.filter.warnings == b.filter.warnings && a.filter.info == b.filter.info &&
+           a.order == b.order && a.groupBy == b.groupBy;
+}
+
 QString ErrorText(const std::exception& error) {
     if (const auto* vtrError = dynamic_cast<const VtrError*>(&error))
         return FromSuiteText(vtrError->Description());
@@ -186,6 +193,14 @@ frmVerifier::frmVerifier(Options options, QWidget* parent)
 }
 
 frmVerifier::~frmVerifier() {
+    // The lists' models read grouping_, a member that is gone before QWidget's own destructor
+    // hides the lists and lays them out one last time: the lists let go of them first.
+    for (ResultsView* list : lvResults_) {
+        if (list) {
+            const QSignalBlocker blocker(list);
+            list->setModel(nullptr);
+        }
+    }
     LibVerify::RemoveNotificationClient(this);
     LibVerify::SetEventPump(nullptr);
     ScopedMousePointer::InstallHooks(nullptr, nullptr);
@@ -207,12 +222,16 @@ void frmVerifier::PumpEvents() {
     }
     // During a run the core calls this after every check and result, thousands of times
     // on a large schedule. Input is handled every time, so a click on Cancel is seen at
-    // once; what the run changes on screen (the log, the lists, the summary) changes at
-    // most every kRepaintIntervalMs, since laying out and drawing costs far more than a
-    // check: in between, handling events finds nothing to draw.
+    // once; what the run changes on screen changes at most every kRepaintIntervalMs (the
+    // summary, the lists that are cheap to add to) or kLogIntervalMs (the log, which costs
+    // the most to lay out and draw), since that costs far more than a check: in between,
+    // handling events finds nothing to draw.
     if (!repaintClock_.isValid() || repaintClock_.hasExpired(kRepaintIntervalMs)) {
         repaintClock_.restart();
-        FlushLog();
+        if (!logClock_.isValid() || logClock_.hasExpired(kLogIntervalMs)) {
+            logClock_.restart();
+            FlushLog();
+        }
         TakeNewResults(false);
         if (summaryPending_)
             RefreshSummary();
@@ -578,11 +597,7 @@ void frmVerifier::ApplyQuery() {
     filterTimer_->stop();
     const ResultQuery query = ChosenQuery();
     for (ResultsView* list : lvResults_) {
-        const ResultQuery& shown = list->Model()->Query();
-        if (shown.filter.text == query.filter.text && shown.filter.errors == query.filter.errors &&
-            shown.filter.warnings == query.filter.warnings &&
-            shown.filter.info == query.filter.info && shown.order == query.order &&
-            shown.groupBy == query.groupBy)
+        if (SameView(list->Model()->Query(), query))
             continue;
         list->Model()->SetQuery(query);
         // The selected result stays in view.
@@ -781,6 +796,7 @@ void frmVerifier::SetRunning(bool running) {
         FlushLog();
         TakeNewResults(true);
         repaintClock_.invalidate();
+        logClock_.invalidate();
         lblStatus_->setText(statusText_);
     }
     cmdCancel_->setEnabled(running);
@@ -822,9 +838,8 @@ void frmVerifier::RefreshSummary() {
     lblChecksRemainingCount_->setText(QString::number(remaining));
     // The errors and warnings of the Results list (whatever its filter hides): as the
     // driver counts them until the user ignores or stops ignoring a result.
-    const SeverityCounts listed = grouping_.Counts(Listing::NotIgnored);
-    lblErrorsCount_->setText(QString::number(listed.errors));
-    lblWarningsCount_->setText(QString::number(listed.warnings));
+    lblErrorsCount_->setText(QString::number(listedCounts_.errors));
+    lblWarningsCount_->setText(QString::number(listedCounts_.warnings));
     // A cancelled run stops short of the checks it dropped, and says so.
     const int total = std::max(1, performed + remaining + (runCancelled_ ? checksDropped_ : 0));
     prgVerification_->setRange(0, total);
@@ -957,6 +972,7 @@ void frmVerifier::Initializing() {
     pendingLog_.clear();
     rtxOutputLog_->clear();
     grouping_.Clear();
+    listedCounts_ = SeverityCounts();
     for (ResultsView* list : lvResults_)
         list->Model()->Clear();
     popupResult_.reset();
@@ -967,7 +983,10 @@ void frmVerifier::Initializing() {
 }
 
 void frmVerifier::ResultAdded(const ResultPtr& result) {
-    grouping_.Add(result, result->Ignorable());
+    const bool ignored = result->Ignorable();
+    grouping_.Add(result, ignored);
+    if (!ignored)
+        listedCounts_.Add(result->Severity());
     // While a run goes, the lists take new results when the window is drawn.
     if (!running_)
         TakeNewResults(true);
@@ -1045,6 +1064,7 @@ void frmVerifier::RefreshIgnoredResults() {
     }
     if (!moved)
         return;
+    listedCounts_ = grouping_.Counts(Listing::NotIgnored);
     RelayoutLists();
     SummaryChanged();
 }
@@ -1250,9 +1270,19 @@ void frmVerifier::ShowSelectedResult() {
     if (tab == OutputLogTab)
         return;
     const bool ignoredList = tab == IgnoredResultsTab;
-    const ResultPtr result = SelectedResult(lvResults_[ignoredList ? 1 : 0]);
+    const ResultsView* list = lvResults_[ignoredList ? 1 : 0];
+    const ResultPtr result = SelectedResult(list);
     if (!result) {
-        fraResultDetails_->ShowResult(nullptr);
+        const QModelIndex current = list->currentIndex();
+        const ResultGroup* group = list->Model()->GroupAt(current);
+        if (group != nullptr && list->selectionModel()->isSelected(current)) {
+            fraResultDetails_->ShowGroup(
+                FromSuiteText(group->title),
+                imlSeverity_->Image(FromSuiteText(SeverityText(group->worst))),
+                ResultsModel::CountsText(group->counts));
+        } else {
+            fraResultDetails_->ShowResult(nullptr);
+        }
         return;
     }
     QString ignoredBy;

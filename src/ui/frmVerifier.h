@@ -226,6 +226,8 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     QPlainTextEdit* rtxOutputLog_ = nullptr;
     // The run's results, for both lists; each list is a view of it.
     ResultGrouping grouping_;
+    // What the Results list holds, by severity (whatever its filter hides).
+    SeverityCounts listedCounts_;
     ResultsView* lvResults_[2] = {nullptr, nullptr};
     // Finding what matters.
     QLineEdit* txtFilter_ = nullptr;
@@ -261,7 +263,9 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     ResultPtr popupResult_;  // the result the pop-up menu was opened on
 
     static constexpr qint64 kRepaintIntervalMs = 50;
+    static constexpr qint64 kLogIntervalMs = 200;
     QElapsedTimer repaintClock_;
+    QElapsedTimer logClock_;
     bool summaryPending_ = false;
     struct LogLine {
         QString text;

@@ -29,12 +29,13 @@ using LibRegistryVTRShared::GetSharedString;
 using LibRegistryVTRShared::SetSharedString;
 using ::testing::HasSubstr;
 
-// Names in the folder other than the store file itself.
+// Names in the folder other than the store file itself (and, on Windows, the file its
+// writers lock, which stays beside it).
 std::vector<std::string> Leftovers(const std::string& folder, const std::string& storeName) {
     std::vector<std::string> names;
     for (const auto& entry : fs::directory_iterator(folder)) {
         const std::string name = entry.path().filename().string();
-        if (name != storeName && name != "tmp")
+        if (name != storeName && name != "tmp" && name != "." + storeName + ".lock")
             names.push_back(name);
     }
     return names;

@@ -792,6 +792,18 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
     QVERIFY(dialogs_->boxes[0].text.startsWith(
         QString::fromStdString("Cannot create the results file " + unwritable)));
+
+    // Never over a file of the suite that the window reads, such as its help file.
+    const std::string helpFile = AppFolder() + "/VTRHelp.chm";
+    vtr::testsupport::WriteFileBytes(helpFile, "help");
+    dialogs_->boxes.clear();
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(helpFile); };
+    Click("cmdSave");
+    QCOMPARE(dialogs_->boxes.size(), 1);
+    QCOMPARE(dialogs_->boxes[0].title, QStringLiteral("Error Saving Verifier Messages"));
+    QVERIFY(dialogs_->boxes[0].text.startsWith(
+        QString::fromStdString("Cannot save the results file as " + helpFile)));
+    QCOMPARE(vtr::testsupport::ReadFileBytes(helpFile), std::string("help"));
 }
 
 void FrmVerifierTest::targetDialogsAndTheirFailures() {
@@ -1644,6 +1656,12 @@ void FrmVerifierTest::groupsCarryTheirCounts() {
                      QStringLiteral("Message 47: Intensity file conflict (1)"),
                      QStringLiteral("Message 21: Show file does not exist (1)")}));
     QCOMPARE(Shown(), QStringLiteral("7 of 7 shown"));
+    // A group's row, selected, is told in the details pane.
+    QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, OnItem(list, Row(list, 0)));
+    QCOMPARE(Find<QLabel>("lblResultSummary")->text(),
+             QStringLiteral("Message 43: Channel conflict"));
+    QCOMPARE(Find<QLabel>("lblResultKind")->text(), QStringLiteral("2 warnings"));
+    QVERIFY(!Find<QPushButton>("cmdCopyResult")->isEnabled());
     // A group's row spans the list; it opens into its results.
     QVERIFY(list->isFirstColumnSpanned(0, QModelIndex()));
     QVERIFY(!list->isExpanded(Row(list, 0)));
