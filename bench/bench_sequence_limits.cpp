@@ -29,7 +29,7 @@
 
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
-#include "sequencelib/SequenceGenerator.h"
+#include "vtrsupport/SequenceGenerator.h"
 #include "support/SequenceBenchSupport.h"
 
 namespace {
