@@ -1225,6 +1225,23 @@ void FrmVerifierTest::versionAndHelpNeedNoDisplay() {
     QCOMPARE(helpStatus, 0);
     QVERIFY(help.contains(QStringLiteral("--registry <FILE>")));
     QVERIFY(help.contains(QStringLiteral("[TARGET]")));
+
+#if defined(Q_OS_UNIX) && !defined(Q_OS_MACOS)
+    // Opening the window with no display at all: a message that says why, not an abort.
+    environment.remove(QStringLiteral("QT_QPA_PLATFORM"));
+    QProcess program;
+    program.setProcessEnvironment(environment);
+    program.start(
+        QStringLiteral(VTR_VERIFIER_PROGRAM),
+        {QStringLiteral("--registry"), QString::fromStdString(folder_->File("registry.reg"))});
+    QVERIFY(program.waitForFinished(30000));
+    QCOMPARE(program.exitStatus(), QProcess::NormalExit);
+    QCOMPARE(program.exitCode(), 3);
+    QCOMPARE(QString::fromLocal8Bit(program.readAllStandardError()),
+             QStringLiteral("vantori-verifier: there is no display to open the window on "
+                            "(neither DISPLAY nor WAYLAND_DISPLAY is set).\nOn a terminal, "
+                            "vantori-verify verifies the same installation without a window.\n"));
+#endif
 }
 
 void FrmVerifierTest::logColoursSuitThePalette() {
