@@ -1153,6 +1153,16 @@ void FrmVerifierTest::relativeTargetsBecomeAbsolute() {
     QVERIFY(
         LogLines().contains(kStamp + QStringLiteral("Show file does not exist: ") + absoluteShow));
 
+#ifndef Q_OS_WIN
+    // Typed from the home folder, as on a terminal.
+    fs::create_directories(folder_->File("home"));
+    const vtr::testsupport::ScopedEnvironment home("HOME", folder_->File("home"));
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("~/Evening.lss"));
+    Click("cmdVerify");
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(),
+             QString::fromStdString(folder_->File("home") + "/Evening.lss"));
+#endif
+
     // Given on the command line (or dropped).
     QVERIFY(window_->SetTargetFile(QStringLiteral("Intro.las")));
     QCOMPARE(Find<QLineEdit>("txtTargetSequence")->text(),
