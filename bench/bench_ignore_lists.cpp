@@ -1,17 +1,18 @@
 // Saving an ignore list. One save is what `vantori-verify ignore --key KEY` (or unignore) does
 // to the settings store: under the store's lock it reads the list afresh, adds or removes the
 // entry and writes the whole list back (entries 1 to count, then the count) in one
-// replacement of the file. Measured on stores whose single-result list holds 1,000, 10,000
-// and 100,000 entries: each iteration un-ignores the list's first entry, which moves every
+// replacement of the file. Measured on stores whose single-result list holds 1,000, 2,000,
+// 10,000 and 100,000 entries: each iteration un-ignores the list's first entry, which moves every
 // other entry one place up (every value rewritten), and ignores it again, which appends it
 // (two saves).
 //
 // Judged by (printed at the end):
 //   one save of 100,000 entries   about a second at most
-//   ratio between sizes           the time of a save over that of a list ten times shorter:
-//                                 about 10 when the cost grows with the list (the store is
-//                                 read, checked and written once per save), 100 if every
-//                                 entry cost a pass over the whole store
+//   ratio between sizes           the time of a save over that of the next shorter list:
+//                                 about the ratio of their lengths when the cost grows with
+//                                 the list (the store is read, checked and written once per
+//                                 save), its square if every entry cost a pass over the
+//                                 whole store
 //   memory per byte of store      the peak resident set of `vantori-verify ignore` on a store
 //                                 of a million keys (a child process) over the store file's
 //                                 size: a small constant, never gigabytes
@@ -25,6 +26,7 @@
 
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
+#include "environment/RegistryFile.h"
 #include "environment/RegistryStore.h"
 #include "support/ChildProcess.h"
 #include "support/SequenceBenchSupport.h"
@@ -54,11 +56,10 @@ std::string StoreWithList(int entries) {
            "\"AppPath\"=\"C:\\\\Program Files\\\\Vantori\\\\\"\r\n"
            "\"UserDataPath\"=\"D:\\\\Shows\\\\\"\r\n\r\n"
            "[HKEY_CURRENT_USER\\Software\\Vantori\\Verifier]\r\n";
-    char count[16];
-    std::snprintf(count, sizeof count, "%08x", entries);
-    out << "\"CountIgnoreMsg\"=dword:" << count << "\r\n";
+    out << "\"CountIgnoreMsg\"=" << RegistryFile::DwordText(static_cast<uint32_t>(entries))
+        << "\r\n";
     for (int n = 1; n <= entries; ++n)
-        out << "\"IgnoreMsg" << n << "\"=\"" << Key(n) << "\"\r\n";
+        out << "\"IgnoreMsg" << n << "\"=" << RegistryFile::QuotedText(Key(n)) << "\r\n";
     return path;
 }
 
@@ -82,6 +83,7 @@ void BM_SaveIgnoreList(benchmark::State& state) {
 
 BENCHMARK(BM_SaveIgnoreList)
     ->Arg(1000)
+    ->Arg(2000)
     ->Arg(10000)
     ->Arg(100000)
     ->Unit(benchmark::kMillisecond)
@@ -109,16 +111,20 @@ int main(int argc, char** argv) {
 
     std::printf("\nOne save of an ignore list (processor time, half an iteration):\n");
     double last = 0;
-    for (const int entries : {1000, 10000, 100000}) {
+    int lastEntries = 0;
+    for (const int entries : {1000, 2000, 10000, 100000}) {
         const auto seconds = times.Seconds("BM_SaveIgnoreList/" + std::to_string(entries));
         if (!seconds)
             continue;
         const double save = *seconds / 2;
         std::printf("  %7d entries: %9.2f ms", entries, save * 1e3);
-        if (last > 0)
-            std::printf("   ratio to ten times fewer: %.1f", save / last);
+        if (last > 0) {
+            std::printf("   ratio to %d entries: %.1f (the list %d times as long)", lastEntries,
+                        save / last, entries / lastEntries);
+        }
         std::printf("\n");
         last = save;
+        lastEntries = entries;
     }
     if (const auto largest = times.Seconds("BM_SaveIgnoreList/100000")) {
         std::printf("  100,000 entries in about a second: %s\n",

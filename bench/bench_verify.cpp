@@ -43,18 +43,13 @@
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
+#include "support/ChildProcess.h"
 #include "support/PeImage.h"
 #include "support/SequenceBenchSupport.h"
 #include "vtrgen/InstallationGenerator.h"
 
 #if defined(__unix__)
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/resource.h>
-#include <sys/wait.h>
-#include <unistd.h>
 #define VTR_BENCH_CHILD_PROCESS 1
-extern char** environ;
 #endif
 
 namespace {
@@ -83,12 +78,7 @@ double ProcessorSeconds() {
 }
 
 // What one run of the verifier cost.
-struct ChildRun {
-    double wallSeconds = 0;
-    double processorSeconds = 0;
-    std::uint64_t peakBytes = 0;
-    int status = -1;
-};
+using bench::ChildRun;
 
 struct Fixture {
     bench::BenchFolder folder;
@@ -178,45 +168,17 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 #if defined(VTR_BENCH_CHILD_PROCESS) && defined(VTR_VERIFY_PROGRAM)
 
-// Runs the program with its output thrown away and waits for it. Its peak resident set is
-// its own only when this process is small: a process started from a large one is charged
-// the large one's resident set too. So the benchmark measures through a fresh copy of
-// itself (RunMeasuredIfAsked), started before it has read anything.
-std::optional<ChildRun> SpawnAndWait(std::vector<std::string> args) {
-    std::vector<char*> argv;
-    for (std::string& arg : args)
-        argv.push_back(arg.data());
-    argv.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
-    posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
-    const auto start = Clock::now();
-    pid_t pid = 0;
-    const int spawned = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (spawned != 0)
-        return std::nullopt;
-    int waitStatus = 0;
-    struct rusage usage {};
-    if (wait4(pid, &waitStatus, 0, &usage) != pid)
-        return std::nullopt;
-    ChildRun run;
-    run.wallSeconds = std::chrono::duration<double>(Clock::now() - start).count();
-    run.processorSeconds =
-        static_cast<double>(usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) +
-        static_cast<double>(usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e6;
-    run.peakBytes = static_cast<std::uint64_t>(usage.ru_maxrss) * 1024;
-    run.status = WIFEXITED(waitStatus) ? WEXITSTATUS(waitStatus) : -1;
-    return run;
-}
+// The program's peak resident set is its own only when this process is small: a process
+// started from a large one is charged the large one's resident set too. So the benchmark
+// measures through a fresh copy of itself (RunMeasuredIfAsked), started before it has read
+// anything, which runs the program with bench::RunChild.
 
 // The measuring copy's side: `--run-measured PROGRAM ARGS...` runs the program and prints
 // its figures.
 bool RunMeasuredIfAsked(int argc, char** argv) {
     if (argc < 3 || std::strcmp(argv[1], "--run-measured") != 0)
         return false;
-    const auto run = SpawnAndWait(std::vector<std::string>(argv + 2, argv + argc));
+    const auto run = bench::RunChild(std::vector<std::string>(argv + 2, argv + argc));
     if (run) {
         std::printf("%.6f %.6f %llu %d\n", run->wallSeconds, run->processorSeconds,
                     static_cast<unsigned long long>(run->peakBytes), run->status);

@@ -4,6 +4,9 @@
 // refused and change nothing, or give bytes that read back, from the bytes alone, to
 // exactly the store with that change.
 //
+// The same changes made as one batch are either refused whole, changing nothing, or give bytes
+// that read back to exactly the store with all of them.
+//
 // The first byte of the input picks the changes, the next up to 24 bytes are the text of a
 // string value to set; the rest is the file.
 
@@ -102,6 +105,36 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, std::size_t size) {
         Apply(document, "set a number", file, [&](Document& d) {
             return d.SetValue(verifier, "CountIgnoreMsg", Value::Dword(choice * 0x01010101u));
         });
+    }
+    if (choice & 0x10) {
+        // A batch: the ignore list's key, a value of the first key the file gives, a new key.
+        Document batch = Document::Parse(file);
+        const std::optional<std::string> before = batch.Serialize();
+        const Key rootBefore = batch.Root();
+        const KeyPath first = FirstLeaf(batch.Root());
+        batch.BeginBatch();
+        batch.CreateKey(verifier);
+        batch.SetValue(verifier, "IgnoreMsg1", Value::String(text));
+        batch.SetValue(verifier, "CountIgnoreMsg", Value::Dword(choice));
+        batch.SetValue(first, "Added", (choice & 1) ? Value::Dword(choice) : Value::String(text));
+        batch.SetValue(verifier, "IgnoreMsg1", Value::String(text + "2"));
+        batch.CreateKey({"Software", "New"});
+        const Key changed = batch.Root();
+        const std::string context = "batch\nfile: " + Printable(file);
+        if (batch.EndBatch() != 0) {
+            VTR_FUZZ_CHECK(batch.Serialize() == before, context + "\nrefused but changed");
+            VTR_FUZZ_CHECK(vtr::RegistryFile::SameContent(batch.Root(), rootBefore), context);
+        } else {
+            const std::optional<std::string> bytes = batch.Serialize();
+            VTR_FUZZ_CHECK(bytes.has_value(), context + "\nchanged but cannot be written");
+            const Document reread = Document::Parse(*bytes);
+            VTR_FUZZ_CHECK(reread.Understood() &&
+                               vtr::RegistryFile::SameContent(reread.Root(), changed) &&
+                               vtr::RegistryFile::SameContent(batch.Root(), changed),
+                           context + "\nwritten: " + Printable(*bytes));
+            VTR_FUZZ_CHECK(reread.Serialize() == bytes,
+                           context + "\nwritten: " + Printable(*bytes));
+        }
     }
     const KeyPath leaf = FirstLeaf(document.Root());
     if (!leaf.empty()) {

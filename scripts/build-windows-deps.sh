@@ -2,8 +2,8 @@
 # Builds, for 64-bit Windows, the libraries Debian has no Windows build of, into a prefix
 # that cmake/mingw-w64-x86_64.cmake reads (VTR_WINDOWS_DEPS):
 #   build-windows-deps.sh PREFIX
-#   - pugixml from Debian's source package (apt-get source, with the machine's own package
-#     sources turned into source entries in a private apt configuration under PREFIX);
+#   - pugixml from Debian's source package (scripts/debian-source.sh: apt-get source, with the
+#     machine's own package sources turned into source entries in a private configuration);
 #   - GoogleTest and GoogleMock from /usr/src/googletest (Debian's googletest package);
 #   - CLI11 and nlohmann-json, header-only, copied from Debian's -dev packages with their
 #     CMake package files.
@@ -21,7 +21,7 @@ prefix=$(cd "$1" && pwd)
 toolchain=$root/cmake/mingw-w64-x86_64.cmake
 stamp=$prefix/.vtr-windows-deps
 # A change of this script, or of the toolchain, makes the prefix again.
-want=$(cat "$0" "$toolchain" | sha256sum | cut -d' ' -f1)
+want=$(cat "$0" "$toolchain" "$root/cmake/mingw-w64-x86_64-compilers.cmake" | sha256sum | cut -d' ' -f1)
 if [ -f "$stamp" ] && [ "$(cat "$stamp")" = "$want" ]; then
     echo "build-windows-deps: $prefix is up to date"
     exit 0
@@ -44,35 +44,7 @@ configure_and_install() {  # source folder, build folder, extra cmake arguments.
 }
 
 # --- pugixml, from Debian's source package -------------------------------------------------
-apt=$work/apt
-mkdir -p "$apt/lists/partial" "$apt/sources.list.d" "$apt/cache/archives/partial"
-found_source=0
-for file in /etc/apt/sources.list.d/*.sources; do
-    [ -f "$file" ] || continue
-    sed -E 's/^Types:.*/Types: deb-src/' "$file" >"$apt/sources.list.d/$(basename "$file")"
-    found_source=1
-done
-for file in /etc/apt/sources.list /etc/apt/sources.list.d/*.list; do
-    [ -f "$file" ] || continue
-    sed -nE 's/^[[:space:]]*deb[[:space:]]/deb-src /p' "$file" \
-        >"$apt/sources.list.d/$(basename "$file" .list)-src.list"
-    found_source=1
-done
-if [ "$found_source" -eq 0 ]; then
-    echo "build-windows-deps: no apt package sources are configured" >&2
-    exit 1
-fi
-apt_options=(
-    -o "Dir::Etc::SourceList=/dev/null" -o "Dir::Etc::SourceParts=$apt/sources.list.d"
-    -o "Dir::State::Lists=$apt/lists" -o "Dir::Cache=$apt/cache"
-    -o "APT::Sandbox::User=root" -q
-)
-echo "build-windows-deps: fetching pugixml's source package"
-apt-get "${apt_options[@]}" update >"$work/apt.log" 2>&1 || { cat "$work/apt.log" >&2; exit 1; }
-(cd "$work" && apt-get "${apt_options[@]}" source pugixml >>"$work/apt.log" 2>&1) ||
-    { cat "$work/apt.log" >&2; exit 1; }
-pugixml_source=$(find "$work" -maxdepth 1 -type d -name 'pugixml-*' | head -n 1)
-[ -n "$pugixml_source" ] || { echo "build-windows-deps: no pugixml source unpacked" >&2; exit 1; }
+pugixml_source=$("$root/scripts/debian-source.sh" "$work" pugixml)
 echo "build-windows-deps: building $(basename "$pugixml_source")"
 configure_and_install "$pugixml_source" "$work/pugixml-build" -DPUGIXML_BUILD_TESTS=OFF
 

@@ -98,11 +98,7 @@ set -e
 
 # Message numbers, severities, summaries, ignored flags and the counts; the details hold the
 # installation's paths, which differ.
-findings() {
-    jq '{checksPerformed, errors, warnings, cancelled,
-         results: [.results[] | {severity, messageNumber, helpContextId, summary, ignored,
-                                 details: (.details | length)}]}' "$1"
-}
+findings() { jq -f "$root/scripts/findings.jq" "$1"; }
 findings "$work/windows.json" >"$work/windows.findings"
 findings "$work/linux.json" >"$work/linux.findings"
 echo "Linux exit status $linux_status, Windows exit status $windows_status"

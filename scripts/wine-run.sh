@@ -1,11 +1,14 @@
 #!/usr/bin/env bash
 # Runs a Windows program under Wine, headless and with bounded time:
-#   wine-run.sh [--prefix DIR] PROGRAM.exe [ARGUMENTS...]
+#   wine-run.sh [--prefix DIR] [--path DIR]... [--display] PROGRAM.exe [ARGUMENTS...]
 #   wine-run.sh [--prefix DIR] --stop          (ends the prefix's Wine server and helpers)
 # The Wine prefix is DIR, else $WINEPREFIX; the user's own ~/.wine is never used. A missing
 # prefix is made first (once, under a lock, so parallel build steps can share it). No X
-# display is needed: the programs are console programs, and the parts of Wine that would
-# download or show something (its .NET and HTML engines, the menu builder) are turned off.
+# display is needed: the programs are console programs or run on Qt's offscreen platform,
+# and the parts of Wine that would download or show something (its .NET and HTML engines,
+# the menu builder) are turned off. --display keeps $DISPLAY, for a window that is to be
+# seen (under Xvfb, say). Each --path folder of the host is searched for DLLs, as the
+# program's own folder would be (Qt's and the compiler's runtime DLLs of a build tree).
 # Wine's runtime files go into the prefix, not the system's temporary folder.
 #
 # Wine's server and its background processes (services, the desktop) outlive the program
@@ -19,12 +22,18 @@
 set -euo pipefail
 
 prefix=${WINEPREFIX:-}
-if [ "${1:-}" = "--prefix" ]; then
-    prefix=$2
-    shift 2
-fi
+search_path=()
+keep_display=0
+while [ $# -gt 0 ]; do
+    case $1 in
+        --prefix) prefix=$2; shift 2 ;;
+        --path) search_path+=("Z:$(cd "$2" && pwd | tr / '\\')"); shift 2 ;;
+        --display) keep_display=1; shift ;;
+        *) break ;;
+    esac
+done
 if [ -z "$prefix" ] || [ $# -eq 0 ]; then
-    echo "usage: wine-run.sh [--prefix DIR] PROGRAM [ARGUMENTS...] | --stop (or set WINEPREFIX)" >&2
+    echo "usage: wine-run.sh [--prefix DIR] [--path DIR]... [--display] PROGRAM [ARGUMENTS...] | --stop" >&2
     exit 2
 fi
 mkdir -p "$prefix"
@@ -43,7 +52,12 @@ export WINEDLLOVERRIDES="mscoree=d;mshtml=d;winemenubuilder.exe=d"
 export WINEARCH=win64
 export TMPDIR=$prefix/.runtime
 mkdir -p "$TMPDIR"
-unset DISPLAY WAYLAND_DISPLAY
+unset WAYLAND_DISPLAY
+[ "$keep_display" -eq 1 ] || unset DISPLAY
+if [ ${#search_path[@]} -gt 0 ]; then
+    WINEPATH=$(IFS=';'; echo "${search_path[*]}")${WINEPATH:+;$WINEPATH}
+    export WINEPATH
+fi
 
 if [ "$1" = "--stop" ]; then
     timeout 30 "$server" -k </dev/null >/dev/null 2>&1 || true

@@ -178,6 +178,10 @@ class FileStore final : public Backend {
                        folder.string() + " could not be made (" + made.message() + ")";
             return Code::PathNotFound;
         }
+        if (StoreFile::IsReadOnly(target).value_or(false)) {
+            std::lock_guard lock(mutex_);
+            return ReadOnly();
+        }
         auto storeLock = std::make_unique<StoreFile::Lock>(target, StoreFile::Lock::On::StoreFile);
         std::lock_guard lock(mutex_);
         if (!storeLock->Held()) {
@@ -185,11 +189,8 @@ class FileStore final : public Backend {
                        StoreFile::ErrorText(storeLock->Error()) + ")";
             return Code::AccessDenied;
         }
-        if (StoreFile::IsReadOnly(target).value_or(false)) {
-            failure_ = "the settings store is read-only: " + path_ +
-                       " (its permissions do not allow writing; it was left as it is)";
-            return Code::WriteProtect;
-        }
+        if (StoreFile::IsReadOnly(target).value_or(false))
+            return ReadOnly();
         std::string problem;
         std::shared_ptr<Document> document = Fresh(target, problem);
         if (!document) {
@@ -305,6 +306,13 @@ class FileStore final : public Backend {
             return Code::BadDatabase;
         found = document->FindKey(entry->path);
         return found != nullptr ? Code::Success : Code::KeyDeleted;
+    }
+
+    // A store file whose own permissions forbid writing it is left as it is.
+    Status ReadOnly() {
+        failure_ = "the settings store is read-only: " + path_ +
+                   " (its permissions do not allow writing; it was left as it is)";
+        return Code::WriteProtect;
     }
 
     bool OwnsChanges() const { return depth_ > 0 && owner_ == std::this_thread::get_id(); }

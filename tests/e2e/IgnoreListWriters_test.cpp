@@ -15,6 +15,7 @@
 
 #include "engine/IgnoreLists.h"
 #include "engine/LibVerify.h"
+#include "environment/RegistryFile.h"
 #include "support/TempStore.h"
 
 #ifndef _WIN32
@@ -110,29 +111,21 @@ std::vector<std::string> InitialKeys() {
     return keys;
 }
 
-std::string Quoted(const std::string& text) {
-    std::string out = "\"";
-    for (const char c : text) {
-        if (c == '\\' || c == '"')
-            out += '\\';
-        out += c;
-    }
-    return out + "\"";
-}
-
 std::string InitialStore() {
     std::string text = kUntouched + "[HKEY_CURRENT_USER\\Software\\Vantori\\Verifier]\r\n";
     const std::vector<std::string> numbers = InitialNumbers();
     const std::vector<std::string> keys = InitialKeys();
-    char count[32];
-    std::snprintf(count, sizeof count, "dword:%08zx", numbers.size());
-    text += "\"CountIgnoreMsgNum\"=" + std::string(count) + "\r\n";
+    text +=
+        "\"CountIgnoreMsgNum\"=" + RegistryFile::DwordText(static_cast<uint32_t>(numbers.size())) +
+        "\r\n";
     for (std::size_t n = 0; n < numbers.size(); ++n)
-        text += "\"IgnoreMsgNum" + std::to_string(n + 1) + "\"=" + Quoted(numbers[n]) + "\r\n";
-    std::snprintf(count, sizeof count, "dword:%08zx", keys.size());
-    text += "\"CountIgnoreMsg\"=" + std::string(count) + "\r\n";
+        text += "\"IgnoreMsgNum" + std::to_string(n + 1) +
+                "\"=" + RegistryFile::QuotedText(numbers[n]) + "\r\n";
+    text += "\"CountIgnoreMsg\"=" + RegistryFile::DwordText(static_cast<uint32_t>(keys.size())) +
+            "\r\n";
     for (std::size_t n = 0; n < keys.size(); ++n)
-        text += "\"IgnoreMsg" + std::to_string(n + 1) + "\"=" + Quoted(keys[n]) + "\r\n";
+        text += "\"IgnoreMsg" + std::to_string(n + 1) + "\"=" + RegistryFile::QuotedText(keys[n]) +
+                "\r\n";
     return text;
 }
 

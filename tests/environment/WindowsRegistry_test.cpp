@@ -10,7 +10,10 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <filesystem>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "engine/VtrError.h"
@@ -112,6 +115,32 @@ TEST_F(WindowsRegistryTest, TheRealRegistryIsTheStoreUnlessAFileIsNamed) {
     }
     RegistryStore::Install(nullptr);  // nothing chosen: the first use takes the registry
     EXPECT_EQ(RegistryStore::CurrentFile(), std::nullopt);
+}
+
+TEST_F(WindowsRegistryTest, AGroupOfChangesHoldsTheLockEveryWriterTakes) {
+    testsupport::ScopedEnvironment profile("LOCALAPPDATA", folder_.File("profile"));
+    const std::string sub = key_ + "\\Verifier";
+    std::atomic<bool> secondBegan{false};
+    std::thread other;
+    {
+        RegistryStore::Changes changes;
+        SetRegString(kCurrentUser, sub, "CountIgnoreMsg", "1");
+        // The registry takes each change as it is made.
+        EXPECT_EQ(ReadRaw(sub, "CountIgnoreMsg").status, ERROR_SUCCESS);
+        other = std::thread([&] {
+            RegistryStore::Changes waiting;
+            secondBegan = true;
+            SetRegString(kCurrentUser, sub, "Second", "2");
+            waiting.Commit();
+        });
+        Sleep(300);
+        EXPECT_FALSE(secondBegan) << "the other writer waits for the lock";
+        changes.Commit();
+    }
+    other.join();
+    EXPECT_TRUE(secondBegan);
+    EXPECT_EQ(GetRegString(kCurrentUser, sub, "Second", ""), "2");
+    EXPECT_TRUE(std::filesystem::exists(folder_.File("profile/Vantori/registry.lock")));
 }
 
 TEST_F(WindowsRegistryTest, ValuesAreStoredWithTheirRegistryTypesAndReadBack) {
