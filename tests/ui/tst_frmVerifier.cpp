@@ -196,6 +196,18 @@ void DoubleClick(QTreeView* list, const QModelIndex& row) {
     }
 }
 
+// The command line's unignore, on the store in that file.
+void UnignoreOnTheCommandLine(const std::string& store, const QStringList& what) {
+    QProcess cli;
+    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
+              QStringList{QStringLiteral("--registry"), QString::fromStdString(store),
+                          QStringLiteral("unignore")} +
+                  what);
+    QVERIFY(cli.waitForFinished(30000));
+    QCOMPARE(cli.exitStatus(), QProcess::NormalExit);
+    QCOMPARE(cli.exitCode(), 0);
+}
+
 }  // namespace
 
 class FrmVerifierTest : public QObject {
@@ -1117,12 +1129,7 @@ void FrmVerifierTest::countersFollowIgnoring() {
     choose(ignored, ignoredMenu, w2, "Stop ignoring all results with this message number");
     QCOMPARE(counters(), (QStringList{"1", "2", "2 of 2 shown"}));
     // The store changed exactly as the command line's unignore changes it.
-    QProcess cli;
-    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
-              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
-               QStringLiteral("unignore"), QStringLiteral("--message"), QStringLiteral("5")});
-    QVERIFY(cli.waitForFinished(30000));
-    QCOMPARE(cli.exitCode(), 0);
+    UnignoreOnTheCommandLine(cliStore, {QStringLiteral("--message"), QStringLiteral("5")});
     QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
 
     choose(ignored, ignoredMenu, e1, "Stop ignoring all results with this message number");
@@ -1349,12 +1356,7 @@ void FrmVerifierTest::stopIgnoringFromTheIgnoredList() {
              (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Six C"), QStringLiteral("Seven D")}));
     QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("2"));
-    QProcess cli;
-    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
-              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
-               QStringLiteral("unignore"), QStringLiteral("--key"), QStringLiteral("5-B / ")});
-    QVERIFY(cli.waitForFinished(30000));
-    QCOMPARE(cli.exitCode(), 0);
+    UnignoreOnTheCommandLine(cliStore, {QStringLiteral("--key"), QStringLiteral("5-B / ")});
     QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
     const std::string store = vtr::testsupport::ReadFileBytes(storeFile);
     QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);
