@@ -110,12 +110,6 @@ bool SameView(const ResultQuery& a, const ResultQuery& b) {
            a.order == b.order && a.groupBy == b.groupBy;
 }
 
-QString ErrorText(const std::exception& error) {
-    if (const auto* vtrError = dynamic_cast<const VtrError*>(&error))
-        return FromSuiteText(vtrError->Description());
-    return FromSuiteText(error.what());
-}
-
 // The screen's pointer as the core's ScopedMousePointer sees it: a number. The window
 // shows it as the application's override cursor.
 int16_t g_pointer = MousePointer::Default;
@@ -1109,10 +1103,8 @@ void frmVerifier::Guarded(const QString& title, Command&& command) {
     try {
         command();
         return;
-    } catch (const std::exception& error) {
-        failure = ErrorText(error);
     } catch (...) {
-        failure = QStringLiteral("Unexpected error");
+        failure = FromSuiteText(DescribeException(std::current_exception(), "Unexpected error"));
     }
     ShowError(title, failure);
 }
@@ -1197,7 +1189,9 @@ void frmVerifier::SaveResultsReport(const std::string& fileName) {
     if (QFileInfo(FromSuiteText(fileName))
             .suffix()
             .compare(QStringLiteral("html"), Qt::CaseInsensitive) == 0) {
-        report::HtmlReport::Save(fileName, report::LastRunReport());
+        report::RunReport run = report::LastRunReport();
+        run.program = "vantori-verifier";
+        report::HtmlReport::Save(fileName, run);
         return;
     }
     ResultsReport::SaveResultsReport(fileName);
