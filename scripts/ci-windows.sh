@@ -1,23 +1,18 @@
 #!/usr/bin/env bash
-# The Windows job: builds the verifier (the command line and the window), its tests and the
-# demo installation for 64-bit Windows with mingw-w64 against Qt built for Windows, runs the
-# core and the window's tests under Wine, then verifies the demo installation under Wine with
-# its settings imported into Wine's registry and checks that the results are those of the
-# Linux build, paths aside.
+# The Windows job: builds the verifier, its core tests and the demo installation for 64-bit
+# Windows with mingw-w64, runs the tests under Wine, then verifies the demo installation
+# under Wine with its settings imported into Wine's registry, and checks that the results
+# are those of the Linux build, paths aside.
 #
 # Folders (each may be set from outside):
 #   VTR_WINDOWS_BUILD_DIR  the Windows build, default build-windows; its Wine prefix is
 #                          build-windows/wineprefix, never the user's ~/.wine
 #   VTR_WINDOWS_DEPS       pugixml and GoogleTest built for Windows, default build-windows-deps
-#   VTR_WINDOWS_QT         Qt built for Windows (about half an hour the first time), kept
-#                          outside the clone so that the next run finds it, default
-#                          ${XDG_CACHE_HOME:-~/.cache}/vantori-verifier/windows-qt
 #   VTR_BUILD_DIR          the Linux build to compare with, default build (made when missing)
 set -euo pipefail
 root=$(cd "$(dirname "$0")/.." && pwd)
 build=${VTR_WINDOWS_BUILD_DIR:-$root/build-windows}
 deps=${VTR_WINDOWS_DEPS:-$root/build-windows-deps}
-qt=${VTR_WINDOWS_QT:-${XDG_CACHE_HOME:-$HOME/.cache}/vantori-verifier/windows-qt}
 linux=${VTR_BUILD_DIR:-$root/build}
 prefix=$build/wineprefix
 wine_run=("$root/scripts/wine-run.sh" --prefix "$prefix")
@@ -35,12 +30,10 @@ stop_wine() {
 trap stop_wine EXIT
 
 step "packages"
-"$root/scripts/setup-deps.sh" g++-mingw-w64-x86-64-posix libz-mingw-w64-dev wine wine64 jq dpkg-dev \
-    xz-utils qt6-base-dev-tools
+"$root/scripts/setup-deps.sh" g++-mingw-w64-x86-64-posix libz-mingw-w64-dev wine wine64 jq dpkg-dev
 
 step "libraries for Windows"
 VTR_JOBS=$jobs "$root/scripts/build-windows-deps.sh" "$deps"
-VTR_JOBS=$jobs "$root/scripts/build-windows-qt.sh" "$qt"
 
 step "Wine prefix"
 # Made before the build, whose steps under Wine (the listing of the tests) have short limits.
@@ -48,8 +41,7 @@ step "Wine prefix"
 
 step "cross build"
 cmake -S "$root" -B "$build" -G Ninja -DCMAKE_TOOLCHAIN_FILE="$root/cmake/mingw-w64-x86_64.cmake" \
-    -DVTR_WINDOWS_DEPS="$deps" -DVTR_WINDOWS_QT="$qt" -DVTR_BUILD_UI=ON -DVTR_BUILD_TESTS=ON \
-    -DVTR_TEST_TIMEOUT=120 >/dev/null
+    -DVTR_WINDOWS_DEPS="$deps" -DVTR_BUILD_UI=OFF -DVTR_BUILD_TESTS=ON -DVTR_TEST_TIMEOUT=120 >/dev/null
 # The build runs programs under Wine (making the demo, listing the tests).
 cmake --build "$build" -j "$jobs" 2>&1 | tee "$build/build.log"
 if grep -q "warning:" "$build/build.log"; then
@@ -58,7 +50,7 @@ if grep -q "warning:" "$build/build.log"; then
     exit 1
 fi
 
-step "tests under Wine (the core's and the window's)"
+step "tests under Wine"
 # A test that hangs under Wine is stopped after two minutes (VTR_TEST_TIMEOUT above; the
 # slowest take about 16 s) and run once more: a test program that has created the media
 # player control has, now and then, finished its tests and then never ended under Wine. A
@@ -136,5 +128,4 @@ if ! diff "$work/temp-before" "$work/temp-after"; then
     failed=1
 fi
 [ "$failed" -eq 0 ] || exit 1
-
 step "done"
