@@ -287,10 +287,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
     // From here Ctrl-C ends the program as usual: there is nothing left to clean up.
     interrupts.reset();
 
-    if (options.format == OutputFormat::Json)
-        WriteJson(console.out, record, presentation);
-    else
-        WriteText(console.out, record, presentation);
+    WriteOutput(console.out, options.format, record, presentation);
     console.out.flush();
     return status;
 }

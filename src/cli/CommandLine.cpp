@@ -45,6 +45,7 @@ const char* const kFooter =
     "  vantori-verify --schedule --severity error\n"
     "  vantori-verify --schedule --group-by pair --statistics\n"
     "  vantori-verify --show Evening.lss --format json --output evening.json\n"
+    "  vantori-verify --schedule --output report.html\n"
     "  vantori-verify --schedule --fail-on error --baseline last.json --write-baseline "
     "last.json\n"
     "  vantori-verify ignore --message 43\n"
@@ -457,13 +458,15 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
             ->group(triage);
 
     app.add_option("--format", format,
-                   "text (the default) or json: one JSON document with every result")
+                   "text (the default); json: one JSON document with every result; html: "
+                   "the report to read in a browser, with the week at a glance; sarif: for "
+                   "tools that gather the findings of many checkers")
         ->type_name("FORMAT")
         ->group(output_);
     CLI::Option* outputOption =
         app.add_option("--output", output,
-                       "also save the results report: a file name ending in .json gets the JSON "
-                       "document, any other the text report")
+                       "also save the results report, in the format the name's extension asks "
+                       "for: .json, .html, .sarif, any other the text report")
             ->type_name("FILE")
             ->group(output_);
     CLI::Option* colorOption =
@@ -554,10 +557,19 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
     Options options;
     if (registryOption->count() > 0)
         options.registry = registry;
-    if (auto reason = Choose<OutputFormat>(
-            "--format", format, {{"text", OutputFormat::Text}, {"json", OutputFormat::Json}},
-            options.format)) {
+    if (auto reason = Choose<OutputFormat>("--format", format,
+                                           {{"text", OutputFormat::Text},
+                                            {"json", OutputFormat::Json},
+                                            {"html", OutputFormat::Html},
+                                            {"sarif", OutputFormat::Sarif}},
+                                           options.format)) {
         Usage(err, *reason);
+        return ParseOutcome{std::nullopt, ExitStatus::Usage};
+    }
+    if (chosen == ignored && options.format != OutputFormat::Text &&
+        options.format != OutputFormat::Json) {
+        Usage(err, "\"ignored\" lists the ignore lists as text or json, not " + format + "; the " +
+                       format + " report is a verification's");
         return ParseOutcome{std::nullopt, ExitStatus::Usage};
     }
 

@@ -11,7 +11,7 @@
 // The command line of vantori-verify:
 //
 //   vantori-verify (--schedule | --show FILE | --sequence FILE) [--registry FILE]
-//                  [--format text|json] [--output FILE] [--log] [-q|--quiet]
+//                  [--format text|json|html|sarif] [--output FILE] [--log] [-q|--quiet]
 //                  [--severity error|warning|info] [--fail-on error|warning|never]
 //                  [--group-by message|show|sequence|pair] [--statistics]
 //                  [--color auto|always|never] [--baseline FILE] [--write-baseline FILE]
@@ -34,7 +34,8 @@ inline constexpr int Internal = 70;    // an unexpected failure of the program i
 
 enum class Command { Verify, Ignore, Unignore, ListIgnored };
 enum class TargetKind { Schedule, Show, Sequence };
-enum class OutputFormat { Text, Json };
+// What a verification prints on standard output (the ignore lists: text or JSON only).
+enum class OutputFormat { Text, Json, Html, Sarif };
 // Which findings make the exit status other than 0.
 enum class FailOn { Warning, Error, Never };
 enum class ColorChoice { Auto, Always, Never };

@@ -110,6 +110,8 @@ struct VerificationState {
     YearSchedulePtr yearlySchedule;
     std::string yearlyScheduleFile;
     FileLoadCounts loadCounts;
+    RunInfo selected;  // the target as selected, without the times
+    RunInfo run;       // the target and times of the current (or last) run
 
     VerificationState() = default;
     VerificationState(const VerificationState&) = delete;
@@ -332,12 +334,14 @@ OrderedStringSet& IgnoredResultKeys() {
 void SetScheduleFiles(const std::string& weeklyFile, const std::string& yearlyFile) {
     FilesRead::SetTargetFiles({weeklyFile, yearlyFile});
     SelectScheduleFiles(weeklyFile, yearlyFile);
+    State().selected = RunInfo{TargetKind::Schedule, {}, {}, {}, {}};
 }
 
 void VerifyShowFile(const std::string& showFile) {
     DeleteTempFiles();
     FilesRead::SetTargetFiles({showFile});
     BuildShowTarget(showFile);
+    State().selected = RunInfo{TargetKind::Show, showFile, {}, {}, {}};
 }
 
 void VerifySequenceFile(const std::string& sequenceFile) {
@@ -359,6 +363,7 @@ void VerifySequenceFile(const std::string& sequenceFile) {
         RaiseTargetError(kSource, "Cannot write temporary show file " + showFile);
 
     BuildShowTarget(showFile);
+    state.selected = RunInfo{TargetKind::Sequence, sequenceFile, {}, {}, {}};
 }
 
 const std::string& VerifiedWeeklyScheduleFile() {
@@ -423,6 +428,10 @@ void RunVerification() {
     if (state.running)
         return;
     state.running = true;
+    state.run = state.selected;
+    state.run.started = DateTime::Now();
+    state.run.startedUtc = std::chrono::system_clock::now();
+    state.run.finishedUtc = state.run.startedUtc;
 
     ResumeStep([] { BeginVerification(); });
 
@@ -449,6 +458,7 @@ void RunVerification() {
 
     state.verifying = false;
     state.running = false;
+    state.run.finishedUtc = std::chrono::system_clock::now();
     DeleteTempFiles();
     const bool cancelled = state.cancelled;
     Broadcast([&](INotificationClient& client) { client.ChecksCompleted(cancelled); });
@@ -521,6 +531,18 @@ std::shared_ptr<Show> LoadShow(const std::string& fileName) {
     return show;
 }
 
+std::shared_ptr<Show> LoadedShow(const std::string& fileName) {
+    const VerificationState& state = State();
+    const auto cached = state.showCache.find(fileName);
+    return cached == state.showCache.end() ? nullptr : cached->second;
+}
+
+std::shared_ptr<seqlib::Sequence> LoadedSequence(const std::string& fileName) {
+    const VerificationState& state = State();
+    const auto cached = state.sequenceCache.find(fileName);
+    return cached == state.sequenceCache.end() ? nullptr : cached->second;
+}
+
 NetworkPreferences& GetNetworkPreferences() {
     VerificationState& state = State();
     if (!state.networkPreferences)
@@ -568,6 +590,10 @@ int32_t ChecksPerformedCount() {
 
 int32_t ChecksRemainingCount() {
     return static_cast<int32_t>(State().pendingChecks.Size());
+}
+
+RunInfo GetRunInfo() {
+    return State().run;
 }
 
 FileLoadCounts GetFileLoadCounts() {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <functional>
 #include <string>
@@ -10,6 +11,7 @@
 #include "engine/Messages.h"
 #include "engine/OrderedStringSet.h"
 #include "engine/Result.h"
+#include "schedule/DateTime.h"
 
 namespace vtr {
 class Show;
@@ -118,6 +120,10 @@ std::string ShellCommandText(const std::string& identifier);
 // The schedules of the current target, loaded on first request in a run.
 std::shared_ptr<Schedule> GetSchedule();
 std::shared_ptr<YearSchedule> GetYearSchedule();
+// What the current (or last) run has loaded of that file, without reading anything: nullptr
+// when the run did not load it or could not (for the reports, after a run).
+std::shared_ptr<Show> LoadedShow(const std::string& fileName);
+std::shared_ptr<seqlib::Sequence> LoadedSequence(const std::string& fileName);
 
 // --- Summary ---------------------------------------------------------------------------------
 
@@ -132,5 +138,18 @@ struct FileLoadCounts {
     int32_t sequenceLoads = 0;
 };
 FileLoadCounts GetFileLoadCounts();
+
+// What the current (or last) run verified, as the target was selected; when it began, by the
+// local clock (DateTime::Now, which tests may set) and by the system clock; and when it ended
+// (its start while it runs).
+enum class TargetKind { Schedule, Show, Sequence };
+struct RunInfo {
+    TargetKind target = TargetKind::Schedule;
+    std::string targetFile;  // the show or sequence; empty for the schedule
+    DateTime started;
+    std::chrono::system_clock::time_point startedUtc;
+    std::chrono::system_clock::time_point finishedUtc;
+};
+RunInfo GetRunInfo();
 
 }  // namespace vtr::LibVerify

@@ -72,6 +72,16 @@ std::optional<QString> QtDialogPresenter::ChooseFile(QWidget* parent,
             dialog.setAcceptMode(QFileDialog::AcceptSave);
             dialog.setFileMode(QFileDialog::AnyFile);
             dialog.setDefaultSuffix(request.defaultExtension);
+            // A name typed without an extension gets the one of the type chosen.
+            QObject::connect(
+                &dialog, &QFileDialog::filterSelected, &dialog,
+                [&dialog, &request](const QString& chosen) {
+                    for (const FileFilter& filter : request.filters) {
+                        if (FilterText(filter) == chosen && !filter.patterns.isEmpty() &&
+                            filter.patterns.constFirst().startsWith(QStringLiteral("*.")))
+                            dialog.setDefaultSuffix(filter.patterns.constFirst().mid(2));
+                    }
+                });
             dialog.setOption(QFileDialog::DontConfirmOverwrite, !request.promptToOverwrite);
         } else {
             dialog.setAcceptMode(QFileDialog::AcceptOpen);

@@ -46,6 +46,7 @@
 #include "engine/ScopedMousePointer.h"
 #include "engine/VtrError.h"
 #include "environment/VTRCommon.h"
+#include "report/HtmlReport.h"
 
 namespace vtr {
 namespace {
@@ -344,7 +345,8 @@ void frmVerifier::BuildControls() {
     cmdVerify_ = new QPushButton(QStringLiteral("&Verify"), central);
     cmdVerify_->setObjectName(QStringLiteral("cmdVerify"));
     cmdHelp_->setToolTip(QStringLiteral("Help on the selected result (F1)"));
-    cmdSave_->setToolTip(QStringLiteral("Save the results to a text file (Ctrl+S)"));
+    cmdSave_->setToolTip(
+        QStringLiteral("Save the results to a text file or an HTML report (Ctrl+S)"));
     cmdCancel_->setToolTip(QStringLiteral("Stop the verification (Esc)"));
     cmdVerify_->setToolTip(QStringLiteral("Verify the target (F5)"));
     connect(cmdHelp_, &QPushButton::clicked, this, &frmVerifier::Help);
@@ -1176,6 +1178,8 @@ std::string frmVerifier::ChooseResultsReportFile() {
     request.fileName = FromSuiteText(settings.fileName);
     request.defaultExtension = FromSuiteText(settings.defaultExtension);
     request.filters = ParseFilterList(FromSuiteText(settings.filter));
+    // Beside the text report, the HTML report to read in a browser or send to someone.
+    request.filters.append(FileFilter{QStringLiteral("HTML report"), {QStringLiteral("*.html")}});
     request.filterIndex = settings.filterIndex;
     request.promptToOverwrite = settings.promptToOverwrite;
     request.hideReadOnlyBox = settings.hideReadOnlyBox;
@@ -1186,6 +1190,14 @@ std::string frmVerifier::ChooseResultsReportFile() {
 }
 
 void frmVerifier::SaveResultsReport(const std::string& fileName) {
+    if (QFileInfo(FromSuiteText(fileName))
+            .suffix()
+            .compare(QStringLiteral("html"), Qt::CaseInsensitive) == 0) {
+        report::RunReport run = report::LastRunReport();
+        run.program = "vantori-verifier";
+        report::HtmlReport::Save(fileName, run);
+        return;
+    }
     ResultsReport::SaveResultsReport(fileName);
 }
 

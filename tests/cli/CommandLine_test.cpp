@@ -227,7 +227,7 @@ TEST(CommandLineTest, AMistypedOptionCommandOrValueGetsASuggestion) {
     EXPECT_EQ(reason({"--schedule", "--fail-on", "always"}),
               "vantori-verify: --fail-on takes warning, error or never, not \"always\"");
     EXPECT_EQ(reason({"--schedule", "--format", "xml"}),
-              "vantori-verify: --format takes text or json, not \"xml\"");
+              "vantori-verify: --format takes text, json, html or sarif, not \"xml\"");
     EXPECT_EQ(reason({"--schedule", "--color", "sometimes"}),
               "vantori-verify: --color takes auto, always or never, not \"sometimes\"");
     EXPECT_EQ(reason({"--show"}), "vantori-verify: --show needs a value: --show FILE");

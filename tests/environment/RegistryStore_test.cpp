@@ -5,12 +5,14 @@
 
 #include <chrono>
 #include <filesystem>
+#include <future>
 #include <random>
 #include <thread>
 
 #include "engine/VtrError.h"
 #include "environment/LibRegistryVTRShared.h"
 #include "environment/RegistryFile.h"
+#include "environment/StoreFile.h"
 #include "support/Raised.h"
 #include "support/TempStore.h"
 
@@ -182,6 +184,22 @@ TEST_F(RegistryStoreTest, AReadOnlyStoreFileIsRefusedAndLeftAsItIs) {
     EXPECT_EQ(fs::status(StoreFile()).permissions() & fs::perms::all, readOnly);
     EXPECT_TRUE(RegistryStore::Describe().condition.readOnly);
     EXPECT_TRUE(Leftovers(folder_.Path(), "registry.reg").empty());
+    EXPECT_FALSE(fs::exists(folder_.File(".registry.reg.lock"))) << "nothing made beside it";
+
+    // Refused at once, not after waiting for a writer that holds the store's lock.
+    std::future<std::string> refusal;
+    bool answered = false;
+    {
+        vtr::StoreFile::Lock held(StoreFile(), vtr::StoreFile::Lock::On::StoreFile);
+        ASSERT_TRUE(held.Held());
+        refusal = std::async(std::launch::async, [] {
+            return testsupport::RaisedDescription([] { RegistryStore::Changes changes; });
+        });
+        answered = refusal.wait_for(std::chrono::seconds(10)) == std::future_status::ready;
+    }
+    EXPECT_TRUE(answered) << "the refusal waited for the lock";
+    EXPECT_EQ(refusal.get(), expected);
+    EXPECT_EQ(ReadStore(), original);
 
     // Writable for its owner only: not read-only.
     fs::permissions(StoreFile(), fs::perms::owner_read | fs::perms::owner_write);

@@ -764,9 +764,9 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     QCOMPARE(request.initialFolder, QString::fromStdString(vtr::VTRCommon::GetUserDataPath()));
     QCOMPARE(request.fileName, QStringLiteral("VTRVerifier Results"));
     QCOMPARE(request.defaultExtension, QStringLiteral("txt"));
-    QCOMPARE(
-        request.filters,
-        (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}}}));
+    QCOMPARE(request.filters,
+             (QList<FileFilter>{{QStringLiteral("Text Files (*.txt)"), {QStringLiteral("*.txt")}},
+                                {QStringLiteral("HTML report"), {QStringLiteral("*.html")}}}));
     QCOMPARE(request.filterIndex, 1);
     QVERIFY(request.promptToOverwrite && request.hideReadOnlyBox && request.pathMustExist &&
             request.refuseReadOnlyFile);
@@ -775,6 +775,19 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
                  std::string(79, '=') +
                  "\r\nMessage Number: 6\r\nSeverity: Error\r\nDescription: Six\r\n"
                  "Detail #1: B\r\nDetail #2: C\r\n");
+    QVERIFY(dialogs_->boxes.isEmpty());
+
+    // A name ending in .html gets the HTML report of the same results.
+    const std::string page = folder_->File("report.html");
+    dialogs_->answer = [&](const FileDialogRequest&) { return QString::fromStdString(page); };
+    Click("cmdSave");
+    const std::string html = vtr::testsupport::ReadFileBytes(page);
+    QVERIFY(html.starts_with("<!DOCTYPE html>"));
+    QVERIFY(html.find("<meta name=\"generator\" content=\"vantori-verifier ") != std::string::npos);
+    QVERIFY(html.find("id=\"count-errors\" data-count=\"1\"") != std::string::npos);
+    QVERIFY(html.find("id=\"count-warnings\" data-count=\"1\"") != std::string::npos);
+    QVERIFY(html.find("<span class=\"sm\">Six</span><ul class=\"d\"><li>B</li><li>C</li></ul>") !=
+            std::string::npos);
     QVERIFY(dialogs_->boxes.isEmpty());
 
     // Cancelling the dialog saves nothing.
