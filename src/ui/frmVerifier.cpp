@@ -92,7 +92,7 @@ TargetKind KindOfFile(const QString& path) {
 // the file this way, and so does the key that ignores one of them, wherever the window is
 // opened next. Empty stays empty.
 QString AbsoluteTarget(const QString& path) {
-    const QString trimmed = path.trimmed();
+    QString trimmed = path.trimmed();
     if (trimmed.isEmpty())
         return trimmed;
     return QDir::toNativeSeparators(
@@ -104,12 +104,6 @@ bool SameView(const ResultQuery& a, const ResultQuery& b) {
     return a.filter.text == b.filter.text && a.filter.errors == b.filter.errors &&
            a.filter.warnings == b.filter.warnings && a.filter.info == b.filter.info &&
            a.order == b.order && a.groupBy == b.groupBy;
-}
-
-QString ErrorText(const std::exception& error) {
-    if (const auto* vtrError = dynamic_cast<const VtrError*>(&error))
-        return FromSuiteText(vtrError->Description());
-    return FromSuiteText(error.what());
 }
 
 // The screen's pointer as the core's ScopedMousePointer sees it: a number. The window
@@ -1105,10 +1099,8 @@ void frmVerifier::Guarded(const QString& title, Command&& command) {
     try {
         command();
         return;
-    } catch (const std::exception& error) {
-        failure = ErrorText(error);
     } catch (...) {
-        failure = QStringLiteral("Unexpected error");
+        failure = FromSuiteText(DescribeException(std::current_exception(), "Unexpected error"));
     }
     ShowError(title, failure);
 }

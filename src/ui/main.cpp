@@ -88,12 +88,9 @@ int main(int argc, char** argv) {
         }
         window.show();
         return application.exec();
-    } catch (const vtr::VtrError& error) {
+    } catch (...) {
         QMessageBox::critical(nullptr, QStringLiteral("Verifier Error"),
-                              vtr::FromSuiteText(error.Description()));
-    } catch (const std::exception& error) {
-        QMessageBox::critical(nullptr, QStringLiteral("Verifier Error"),
-                              vtr::FromSuiteText(error.what()));
+                              vtr::FromSuiteText(vtr::DescribeException(std::current_exception())));
     }
     return 1;
 }
