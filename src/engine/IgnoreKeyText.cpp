@@ -4,10 +4,10 @@
 #include <cstdint>
 
 namespace vtr::IgnoreKeyText {
-namespace {
 
-// The length of the UTF-8 character at the start of the bytes, or 0 when none begins there.
 std::size_t CharacterLength(std::string_view bytes) {
+    if (bytes.empty())
+        return 0;
     const auto byte = [&](std::size_t i) { return static_cast<unsigned char>(bytes[i]); };
     const unsigned char first = byte(0);
     if (first < 0x80)
@@ -39,6 +39,8 @@ std::size_t CharacterLength(std::string_view bytes) {
         return 0;
     return length;
 }
+
+namespace {
 
 bool IsControl(unsigned char byte) {
     return byte < 0x20 || byte == 0x7F;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -35,5 +36,9 @@ std::optional<std::string> Decode(std::string_view text);
 // True when the bytes are UTF-8: no stray continuation byte, no overlong form, no surrogate,
 // nothing above U+10FFFF.
 bool IsUtf8(std::string_view bytes);
+
+// The length of the well-formed UTF-8 character at the start of the bytes (1 to 4), or 0 when
+// they do not begin with one or are empty.
+std::size_t CharacterLength(std::string_view bytes);
 
 }  // namespace vtr::IgnoreKeyText

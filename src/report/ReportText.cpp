@@ -2,6 +2,8 @@
 
 #include <cstdint>
 
+#include "engine/IgnoreKeyText.h"
+
 #ifdef _WIN32
 #include <windows.h>
 #endif
@@ -10,45 +12,6 @@ namespace vtr::report {
 namespace {
 
 constexpr std::string_view kReplacement = "\xEF\xBF\xBD";  // U+FFFD
-
-bool IsContinuation(unsigned char byte) {
-    return (byte & 0xC0) == 0x80;
-}
-
-// The length of the well-formed UTF-8 sequence at the start of text, or 0 when there is none.
-std::size_t SequenceLength(std::string_view text) {
-    const auto lead = static_cast<unsigned char>(text[0]);
-    if (lead < 0x80)
-        return 1;
-    std::size_t length = 0;
-    uint32_t codePoint = 0;
-    if (lead >= 0xC2 && lead <= 0xDF) {
-        length = 2;
-        codePoint = lead & 0x1Fu;
-    } else if (lead >= 0xE0 && lead <= 0xEF) {
-        length = 3;
-        codePoint = lead & 0x0Fu;
-    } else if (lead >= 0xF0 && lead <= 0xF4) {
-        length = 4;
-        codePoint = lead & 0x07u;
-    } else {
-        return 0;
-    }
-    if (text.size() < length)
-        return 0;
-    for (std::size_t i = 1; i < length; ++i) {
-        const auto byte = static_cast<unsigned char>(text[i]);
-        if (!IsContinuation(byte))
-            return 0;
-        codePoint = (codePoint << 6) | (byte & 0x3Fu);
-    }
-    const bool overlong =
-        (length == 3 && codePoint < 0x800) || (length == 4 && codePoint < 0x10000);
-    const bool surrogate = codePoint >= 0xD800 && codePoint <= 0xDFFF;
-    if (overlong || surrogate || codePoint > 0x10FFFF)
-        return 0;
-    return length;
-}
 
 #ifdef _WIN32
 std::string FromCodePage(std::string_view bytes) {
@@ -101,7 +64,7 @@ std::string ValidUtf8(std::string_view bytes) {
     std::string out;
     out.reserve(bytes.size());
     while (!bytes.empty()) {
-        const std::size_t length = SequenceLength(bytes);
+        const std::size_t length = IgnoreKeyText::CharacterLength(bytes);
         if (length == 0) {
             out += kReplacement;
             bytes.remove_prefix(1);

@@ -1193,7 +1193,9 @@ void frmVerifier::SaveResultsReport(const std::string& fileName) {
     if (QFileInfo(FromSuiteText(fileName))
             .suffix()
             .compare(QStringLiteral("html"), Qt::CaseInsensitive) == 0) {
-        report::HtmlReport::Save(fileName, report::LastRunReport());
+        report::RunReport run = report::LastRunReport();
+        run.program = "vantori-verifier";
+        report::HtmlReport::Save(fileName, run);
         return;
     }
     ResultsReport::SaveResultsReport(fileName);

@@ -783,6 +783,7 @@ void FrmVerifierTest::saveAsksForTheReportFileAndWritesIt() {
     Click("cmdSave");
     const std::string html = vtr::testsupport::ReadFileBytes(page);
     QVERIFY(html.starts_with("<!DOCTYPE html>"));
+    QVERIFY(html.find("<meta name=\"generator\" content=\"vantori-verifier ") != std::string::npos);
     QVERIFY(html.find("id=\"count-errors\" data-count=\"1\"") != std::string::npos);
     QVERIFY(html.find("id=\"count-warnings\" data-count=\"1\"") != std::string::npos);
     QVERIFY(html.find("<span class=\"sm\">Six</span><ul class=\"d\"><li>B</li><li>C</li></ul>") !=
