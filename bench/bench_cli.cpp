@@ -26,10 +26,10 @@
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
 #include "schedule/Schedule.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "show/Show.h"
 #include "show/WholeFile.h"
 #include "support/SequenceBenchSupport.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace {
 

@@ -29,7 +29,7 @@
 #include "schedule/Schedule.h"
 #include "show/Show.h"
 #include "show/WholeFile.h"
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 
 namespace {
 

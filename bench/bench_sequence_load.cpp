@@ -12,8 +12,8 @@
 #include <memory>
 
 #include "sequencelib/Sequence.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "support/SequenceBenchSupport.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace {
 

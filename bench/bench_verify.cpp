@@ -34,19 +34,19 @@
 #include <string>
 #include <vector>
 
-#include "checks/CheckIntersequenceConflicts.h"
+#include "checks/conflicts/CheckIntersequenceConflicts.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
 #include "sequencelib/Sequence.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 #include "show/WholeFile.h"
 #include "support/ChildProcess.h"
-#include "support/PeImage.h"
 #include "support/SequenceBenchSupport.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 #if defined(__unix__)
 #define VTR_BENCH_CHILD_PROCESS 1

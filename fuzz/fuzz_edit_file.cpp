@@ -9,8 +9,8 @@
 #include <string>
 
 #include "FuzzSupport.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "sequencelib/SequenceInfo.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, std::size_t size) {
     std::string_view input = vtr::fuzz::AsText(data, size);

@@ -11,7 +11,7 @@
 
 #include "FuzzSupport.h"
 #include "SequenceSummary.h"
-#include "sequencelib/SequenceGenerator.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, std::size_t size) {
     std::string_view input = vtr::fuzz::AsText(data, size);

@@ -24,8 +24,8 @@
 #include "schedule/Schedule.h"
 #include "schedule/TimeRange.h"
 #include "show/Serialize.h"
-#include "support/PeImage.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 namespace {
 

@@ -7,8 +7,8 @@
 
 #include "engine/VtrError.h"
 #include "schedule/DateTime.h"
-#include "support/PeImage.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 int main(int argc, char** argv) {
     CLI::App app{

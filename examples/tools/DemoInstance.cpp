@@ -10,10 +10,10 @@
 #include <stdexcept>
 #include <vector>
 
-#include "checks/CheckAppFileExists.h"
-#include "checks/CheckAppPathExists.h"
-#include "sequencelib/SequenceGenerator.h"
+#include "checks/installation/CheckAppFileExists.h"
+#include "checks/installation/CheckAppPathExists.h"
 #include "show/Serialize.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace vtr::demo {
 namespace {

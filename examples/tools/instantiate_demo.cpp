@@ -8,7 +8,7 @@
 
 #include "DemoInstance.h"
 #include "schedule/DateTime.h"
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 
 int main(int argc, char** argv) {
     const std::string usage =

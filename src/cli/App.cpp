@@ -315,12 +315,8 @@ int Main(int argc, const char* const* argv, Console& console) {
                 return RunListIgnored(options, console.out);
         }
         return ExitStatus::Usage;
-    } catch (const VtrError& error) {
-        Fail(console.err, error.Description());
-    } catch (const std::exception& error) {
-        Fail(console.err, error.what());
     } catch (...) {
-        Fail(console.err, "unexpected failure");
+        Fail(console.err, DescribeException(std::current_exception(), "unexpected failure"));
     }
     return ExitStatus::Internal;
 }

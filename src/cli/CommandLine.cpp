@@ -342,7 +342,7 @@ CLI::App* AddIgnoreCommand(CLI::App& app, HelpFormatter& help, const std::string
 
 // What an error of the parser means, in plain words.
 std::string PlainReason(const CLI::ParseError& error) {
-    const std::string what = error.what();
+    std::string what = error.what();
     // "--show: 1 required FILE missing": an option without its value.
     const std::size_t colon = what.find(": ");
     if (dynamic_cast<const CLI::ArgumentMismatch*>(&error) != nullptr &&

@@ -9,9 +9,9 @@
 #include <unordered_set>
 #include <utility>
 
-#include "checks/CheckOldKRP.h"
-#include "checks/CheckPostInstall.h"
-#include "checks/CheckWMP.h"
+#include "checks/installation/CheckOldKRP.h"
+#include "checks/installation/CheckPostInstall.h"
+#include "checks/installation/CheckWMP.h"
 #include "engine/IgnoreLists.h"
 #include "engine/VtrError.h"
 #include "environment/FilesRead.h"
@@ -154,19 +154,6 @@ void Broadcast(Operation&& operation) {
 
 constexpr std::size_t kMaxDetails = 9;
 
-// The text of whatever a failed step raised.
-std::string DescribeFailure(const std::exception_ptr& failure) {
-    try {
-        std::rethrow_exception(failure);
-    } catch (const VtrError& error) {
-        return error.Description();
-    } catch (const std::exception& error) {
-        return error.what();
-    } catch (...) {
-        return "Unknown error";
-    }
-}
-
 // The week time that the temporary schedule of a single show starts and ends at: day 1,
 // 3:00:37 and 7:00:37. The odd second keeps the times apart from anything a user schedules
 // by the minute.
@@ -188,7 +175,7 @@ const std::string& MakeTempFile(std::string& slot, const char* prefix, const cha
     try {
         slot = LibFile::MakeTempFileName(prefix);
     } catch (...) {
-        RaiseTargetError(source, DescribeFailure(std::current_exception()));
+        RaiseTargetError(source, DescribeException(std::current_exception()));
     }
     LibFile::RegisterTempFile(slot);
     return slot;
@@ -216,7 +203,7 @@ void BuildShowTarget(const std::string& showFile) {
                                      WeekTimeFunctions::NewWeekTime(kTargetDay, kTargetEndHour,
                                                                     kTargetMinute, kTargetSecond));
     } catch (...) {
-        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+        RaiseTargetError(kSource, DescribeException(std::current_exception()));
     }
     const std::string& weeklyFile = MakeTempFile(state.tempWeeklyFile, "VTRVer-WS-", kSource);
     if (!ResumeStep([&] { schedule->Save(weeklyFile); }))
@@ -260,35 +247,37 @@ void PostTransientMessage(const std::string& message) {
 }
 
 ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpContextId,
-                    int32_t messageNumber, const std::vector<std::string>& details) {
-    auto result = std::make_shared<Result>();
-    result->SetSeverity(severity);
-    result->SetSummary(summary);
-    result->SetHelpContextID(helpContextId);
-    result->SetMessageNumber(messageNumber);
-    // Empty details leave no gap: a result's details are always consecutive from the first.
-    const std::size_t count = std::min(details.size(), kMaxDetails);
-    for (std::size_t i = 0; i < count; ++i) {
-        if (!details[i].empty())
-            result->AddDetail(details[i]);
-    }
-
-    VerificationState& state = State();
-    if (IsResultIgnored(*result)) {
-        state.ignoredResults.push_back(result);
-    } else {
-        state.results.push_back(result);
-        if (severity == Severity::Error) {
-            state.errors.push_back(result);
-        } else if (severity == Severity::Warning) {
-            state.warnings.push_back(result);
+                    int32_t messageNumber, const std::vector<std::string>& details) noexcept {
+    return ResumeOr(ResultPtr{}, [&] {
+        auto result = std::make_shared<Result>();
+        result->SetSeverity(severity);
+        result->SetSummary(summary);
+        result->SetHelpContextID(helpContextId);
+        result->SetMessageNumber(messageNumber);
+        // Empty details leave no gap: a result's details are always consecutive from the first.
+        const std::size_t count = std::min(details.size(), kMaxDetails);
+        for (std::size_t i = 0; i < count; ++i) {
+            if (!details[i].empty())
+                result->AddDetail(details[i]);
         }
-    }
-    Broadcast([&](INotificationClient& client) { client.ResultAdded(result); });
-    return result;
+
+        VerificationState& state = State();
+        if (IsResultIgnored(*result)) {
+            state.ignoredResults.push_back(result);
+        } else {
+            state.results.push_back(result);
+            if (severity == Severity::Error) {
+                state.errors.push_back(result);
+            } else if (severity == Severity::Warning) {
+                state.warnings.push_back(result);
+            }
+        }
+        Broadcast([&](INotificationClient& client) { client.ResultAdded(result); });
+        return result;
+    });
 }
 
-ResultPtr AddResult(const Message& message, const std::vector<std::string>& details) {
+ResultPtr AddResult(const Message& message, const std::vector<std::string>& details) noexcept {
     return AddResult(message.severity, message.summary, message.helpContextId, message.number,
                      details);
 }
@@ -356,7 +345,7 @@ void VerifySequenceFile(const std::string& sequenceFile) {
     try {
         text = ShowFunctions::ShowToText(show);
     } catch (...) {
-        RaiseTargetError(kSource, DescribeFailure(std::current_exception()));
+        RaiseTargetError(kSource, DescribeException(std::current_exception()));
     }
     const std::string& showFile = MakeTempFile(state.tempShowFile, "VTRVer-Show-", kSource);
     if (WriteWholeFile(showFile, text) != 0)
@@ -416,9 +405,9 @@ void BeginVerification() {
     });
     ResumeStep([] { IgnoreLists::LoadIgnoreLists(); });
 
-    ResumeStep([] { AddCheck(std::make_shared<CheckPostInstall>()); });
-    ResumeStep([] { AddCheck(std::make_shared<CheckWMP>()); });
-    ResumeStep([] { AddCheck(std::make_shared<CheckOldKRP>()); });
+    AddCheck(std::make_shared<CheckPostInstall>());
+    AddCheck(std::make_shared<CheckWMP>());
+    AddCheck(std::make_shared<CheckOldKRP>());
 }
 
 void RunVerification() {
@@ -467,7 +456,7 @@ void RunVerification() {
 void CancelVerification() {
     VerificationState& state = State();
     state.cancelled = true;
-    ResumeStep([] { AddResult(Messages::VerificationCancelled); });
+    AddResult(Messages::VerificationCancelled);
     while (!state.pendingChecks.Empty())
         state.pendingChecks.RemoveFront();
     Broadcast([](INotificationClient& client) { client.VerificationCancelled(); });
@@ -483,15 +472,17 @@ bool IsCancelled() {
 
 // --- Services for checks -----------------------------------------------------------------------
 
-void AddCheck(CheckPtr check) {
-    VerificationState& state = State();
-    if (state.cancelled || !check)
-        return;
-    std::string id = check->CheckIdentifier();
-    if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
-        return;
-    state.pendingChecks.Append(std::move(id), check);
-    Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
+void AddCheck(CheckPtr check) noexcept {
+    ResumeStep([&] {
+        VerificationState& state = State();
+        if (state.cancelled || !check)
+            return;
+        std::string id = check->CheckIdentifier();
+        if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
+            return;
+        state.pendingChecks.Append(std::move(id), check);
+        Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
+    });
 }
 
 std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
@@ -508,7 +499,7 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
         sequence = loader.Load(fileName);
     } catch (...) {
         sequence = nullptr;
-        failure = DescribeFailure(std::current_exception());
+        failure = DescribeException(std::current_exception());
     }
     // Kept even when empty: a file that cannot be loaded is not tried again in this run.
     ResumeStep([&] { state.sequenceCache.emplace(fileName, sequence); });

@@ -48,11 +48,13 @@ void PostTransientMessage(const std::string& message);
 // --- Results --------------------------------------------------------------------------
 
 // The result factory: the only way a result enters the verification. Empty details are
-// skipped without leaving a gap; at most nine details are taken.
+// skipped without leaving a gap; at most nine details are taken. Never throws: a result that
+// cannot be made (no memory) is lost and nullptr returned, and a client that fails while
+// being told of it does not keep it from the others.
 ResultPtr AddResult(Severity severity, const std::string& summary, int32_t helpContextId,
-                    int32_t messageNumber, const std::vector<std::string>& details = {});
+                    int32_t messageNumber, const std::vector<std::string>& details = {}) noexcept;
 // The same for a catalog entry: its severity, summary, help-context id and number.
-ResultPtr AddResult(const Message& message, const std::vector<std::string>& details = {});
+ResultPtr AddResult(const Message& message, const std::vector<std::string>& details = {}) noexcept;
 
 // True when the result's message number, or else its IgnoreKey, is in the ignore lists.
 // Never fails.
@@ -107,7 +109,8 @@ bool IsCancelled();
 // --- Services for checks ---------------------------------------------------------------------
 
 // Queues a check unless cancelled or a check with the same identifier is queued or done.
-void AddCheck(CheckPtr check);
+// Never throws: a check whose identifier cannot be worked out is not queued.
+void AddCheck(CheckPtr check) noexcept;
 // The sequence of that file, loaded once per run; nullptr when it cannot be loaded.
 std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName);
 // The show of that file, parsed once per run (failures are not kept); nullptr on failure.

@@ -16,10 +16,9 @@ SavedErr::SavedErr() {
         helpFile_ = error.HelpFile();
         number_ = error.Number();
         source_ = error.Source();
-    } catch (const std::exception& error) {
-        description_ = error.what();
-        other_ = current;
     } catch (...) {
+        // Kept whole, to be raised again as it was; a standard exception's text is shown.
+        description_ = DescribeException(current, "");
         other_ = current;
     }
 }

@@ -129,12 +129,12 @@ std::optional<uint32_t> FindEntry(Reader& file, uint64_t resourceBase, uint32_t 
     const uint32_t entriesOffset = directoryOffset + kResourceDirectorySize;
     if (count == 0 || entriesOffset > resourceSize ||
         count * kResourceEntrySize > resourceSize - entriesOffset ||
-        !file.Read(resourceBase + entriesOffset, count * kResourceEntrySize, bytes)) {
+        !file.Read(resourceBase + entriesOffset, std::size_t{count} * kResourceEntrySize, bytes)) {
         return std::nullopt;
     }
     for (uint32_t i = 0; i < count; ++i) {
-        const uint32_t name = Le32(bytes, i * kResourceEntrySize);
-        const uint32_t target = Le32(bytes, i * kResourceEntrySize + 4);
+        const uint32_t name = Le32(bytes, std::size_t{i} * kResourceEntrySize);
+        const uint32_t target = Le32(bytes, std::size_t{i} * kResourceEntrySize + 4);
         if (wantedId && ((name & kNamedEntryFlag) != 0 || name != *wantedId))
             continue;
         if (((target & kSubdirectoryFlag) != 0) != wantSubdirectory)

@@ -101,6 +101,8 @@ class FileStore final : public Backend {
                 *size = length;
                 return Code::MoreData;
             }
+            // A value's bytes are copied as they are: their length says where they end.
+            // NOLINTNEXTLINE(bugprone-not-null-terminated-result)
             std::memcpy(data, stored.data.data(), length);
         }
         if (type != nullptr)

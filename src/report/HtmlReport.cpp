@@ -596,8 +596,8 @@ class Page {
     void Axis() {
         out_ += "<div class=\"row\"><div class=\"dn\"></div><div class=\"axis\">";
         for (int hour = 0; hour <= 24; hour += 3) {
-            out_ += "<span style=\"left:" + Percent(hour * 3600) + "\">" + TwoDigits(hour) +
-                    ":00</span>";
+            out_ += "<span style=\"left:" + Percent(int64_t{hour} * 3600) + "\">" +
+                    TwoDigits(hour) + ":00</span>";
         }
         out_ += "</div></div>";
     }

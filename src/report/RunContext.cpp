@@ -1,7 +1,7 @@
 #include <set>
 
 #include "VtrVersion.h"
-#include "checks/CheckLoadShowFile.h"
+#include "checks/show/CheckLoadShowFile.h"
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "environment/RegistryStore.h"

@@ -65,7 +65,8 @@ class DateTime {
     // "yyyy-mm-dd".
     std::string DateString() const;
 
-    auto operator<=>(const DateTime&) const = default;
+    // clang-tidy takes the 0 that a defaulted <=> is compared with for a null pointer.
+    auto operator<=>(const DateTime&) const = default;  // NOLINT(modernize-use-nullptr)
     bool operator==(const DateTime&) const = default;
 
   private:

@@ -156,7 +156,7 @@ class GzipSource final : public ByteSource {
     std::uint64_t FileBytesTotal() const override { return raw_->FileBytesTotal(); }
 
   private:
-    static constexpr std::size_t kInputBytes = 256 * 1024;
+    static constexpr std::size_t kInputBytes = std::size_t{256} * 1024;
     static constexpr std::size_t kMaxOutputPerCall = std::size_t{1} << 30;
 
     bool Refill() {

@@ -54,7 +54,7 @@ QString HelpBrowser::DecodePage(const QByteArray& bytes) {
         return decoder.decode(bytes);
     }
     QStringDecoder utf8(QStringConverter::Utf8);
-    const QString text = utf8.decode(bytes);
+    QString text = utf8.decode(bytes);
     if (!utf8.hasError())
         return text;
     // Older help pages are in a single-byte code page.

@@ -125,7 +125,7 @@ class frmVerifier : public QMainWindow, public INotificationClient {
     // Chooses a file as the target by its kind: "lss" a show, "las"/"lms" a sequence
     // (any letter case), named by its absolute path (a relative one is taken from the working
     // folder). False, with nothing changed, for anything else or while running.
-    bool SetTargetFile(const QString& path);
+    bool SetTargetFile(const QString& file);
 
     // The report dialog: the chosen file name, or "" when the user cancelled.
     std::string ChooseResultsReportFile();

@@ -12,8 +12,8 @@
 #include "cli/CliTestSupport.h"
 #include "engine/LibVerify.h"
 #include "schedule/DateTime.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::cli::testing {
 

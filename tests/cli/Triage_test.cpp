@@ -15,9 +15,9 @@
 #include "cli/DemoFixture.h"
 #include "engine/LibVerify.h"
 #include "show/Show.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::cli {
 namespace {

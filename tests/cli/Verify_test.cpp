@@ -7,7 +7,7 @@
 #include <regex>
 #include <set>
 
-#include "checks/CheckAppFileExists.h"
+#include "checks/installation/CheckAppFileExists.h"
 #include "cli/DemoFixture.h"
 #include "engine/LibVerify.h"
 #include "environment/VTRCommon.h"

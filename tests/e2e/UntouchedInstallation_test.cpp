@@ -23,10 +23,10 @@
 #include "environment/RegistryFile.h"
 #include "environment/VTRCommon.h"
 #include "schedule/DateTime.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 #ifndef _WIN32
 #include <sys/stat.h>

@@ -147,6 +147,28 @@ TEST_F(LibVerifyTest, ClientsAreToldInOrderAndOneThatFailsDoesNotStopTheOthers) 
     EXPECT_EQ(LibVerify::WarningCount(), 1);
 }
 
+// A check that cannot say who it is.
+class NamelessCheck : public ICheck {
+  public:
+    void Check() override {}
+    std::string CheckIdentifier() override { throw std::length_error("identifier too long"); }
+    std::string Description() override { return "Nameless"; }
+};
+
+TEST_F(LibVerifyTest, AddCheckNeverThrowsAndLeavesOutACheckThatCannotBeIdentified) {
+    RecordingClient client("1", log_);
+    Register(client);
+    std::vector<std::string> swallowed;
+    static std::vector<std::string>* told = nullptr;
+    told = &swallowed;
+    const ResumeReporter saved = GetResumeReporter();
+    SetResumeReporter([](std::string_view description) { told->emplace_back(description); });
+    LibVerify::AddCheck(std::make_shared<NamelessCheck>());
+    SetResumeReporter(saved);
+    EXPECT_TRUE(log_.empty());  // nobody was told of a check added
+    EXPECT_THAT(swallowed, ElementsAre("identifier too long"));
+}
+
 TEST_F(LibVerifyTest, ProgressIsPostedOncePerPercentWithTheFixedTextAndPumpsEvents) {
     RecordingClient client("c", log_);
     Register(client);

@@ -7,8 +7,8 @@
 #include <filesystem>
 #include <random>
 
-#include "support/PeImage.h"
 #include "support/TempStore.h"
+#include "vtrsupport/PeImage.h"
 
 #ifndef _WIN32
 #include <sys/stat.h>

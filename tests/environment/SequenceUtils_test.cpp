@@ -5,8 +5,8 @@
 #include "engine/LibVerify.h"
 #include "engine/VtrError.h"
 #include "environment/SequenceLoader.h"
-#include "sequencelib/SequenceGenerator.h"
 #include "support/TempStore.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace vtr {
 namespace {

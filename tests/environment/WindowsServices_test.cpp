@@ -20,8 +20,8 @@
 #include "environment/LibSecurityTokens.h"
 #include "environment/MediaPlayerProbe.h"
 #include "environment/VTRCommon.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr {
 namespace {

@@ -7,11 +7,11 @@
 #include <map>
 #include <stdexcept>
 
-#include "checks/CheckAppFileExists.h"
+#include "checks/installation/CheckAppFileExists.h"
 #include "environment/FileVersion.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::demo {
 namespace {

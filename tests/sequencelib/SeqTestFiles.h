@@ -8,7 +8,7 @@
 #include <string>
 
 #include "engine/VtrError.h"
-#include "sequencelib/SequenceGenerator.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 // Fixture files for the sequence library's tests: a private temporary folder that is
 // removed with everything in it, and gzip data made in memory.

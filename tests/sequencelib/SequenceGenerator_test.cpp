@@ -1,4 +1,4 @@
-#include "sequencelib/SequenceGenerator.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 #include <gtest/gtest.h>
 

@@ -2,11 +2,11 @@
 
 #include <filesystem>
 
-#include "checks/CheckAppFileExists.h"
-#include "checks/CheckAppPathExists.h"
+#include "checks/installation/CheckAppFileExists.h"
+#include "checks/installation/CheckAppPathExists.h"
 #include "engine/LibVerify.h"
 #include "environment/RegistryFile.h"
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr::testsupport {
 

@@ -1,7 +1,7 @@
 // The generator of whole installations: what it writes, that it writes the same every
 // time, and that a verification of the entire schedule of what it wrote finds exactly the
 // problems it was asked to put in.
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -17,9 +17,9 @@
 #include "schedule/YearSchedule.h"
 #include "sequencelib/Sequence.h"
 #include "show/Show.h"
-#include "support/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr {
 namespace {
