@@ -217,8 +217,13 @@ TEST_F(RegistryStoreTest,
     const std::string lockFile = vtr::StoreFile::LockFileOf(StoreFile());
     const fs::path locks = fs::path(std::getenv("LOCALAPPDATA")) / "Vantori" / "locks";
     EXPECT_EQ(fs::path(lockFile).parent_path(), locks);
-    EXPECT_THAT(fs::path(lockFile).filename().string(),
-                ::testing::MatchesRegex("store-[0-9a-f]{16}\\.lock"));
+    // "store-", sixteen lower-case hexadecimal digits, ".lock" (GoogleTest's regular
+    // expressions on Windows have no character classes).
+    const std::string name = fs::path(lockFile).filename().string();
+    ASSERT_EQ(name.size(), 27u) << name;
+    EXPECT_EQ(name.substr(0, 6), "store-") << name;
+    EXPECT_EQ(name.substr(22), ".lock") << name;
+    EXPECT_EQ(name.find_first_not_of("0123456789abcdef", 6), 22u) << name;
 
     // Missing, then created: the same lock file.
     fs::remove(StoreFile());
