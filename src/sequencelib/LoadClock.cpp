@@ -7,7 +7,7 @@
 #ifdef _WIN32
 #include <windows.h>
 #else
-#include <time.h>
+#include <ctime>  // clock_gettime, a POSIX addition to it
 #endif
 
 namespace vtr::seqlib::detail {
