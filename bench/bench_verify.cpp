@@ -63,6 +63,7 @@
 namespace {
 
 using namespace vtr;
+using bench::ChildRun;
 using Clock = std::chrono::steady_clock;
 
 // The installation's size: sequences of a three-minute show, a thousand events per channel
@@ -84,9 +85,6 @@ constexpr int32_t kDoublingSequences = 12;
 double ProcessorSeconds() {
     return static_cast<double>(std::clock()) / CLOCKS_PER_SEC;
 }
-
-// What one run of the verifier cost.
-using bench::ChildRun;
 
 struct Fixture {
     bench::BenchFolder folder;
@@ -178,48 +176,12 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 #if defined(VTR_BENCH_CHILD_PROCESS) && defined(VTR_VERIFY_PROGRAM)
 
-// The program's peak resident set is its own only when this process is small: a process
-// started from a large one is charged the large one's resident set too. So the benchmark
-// measures through a fresh copy of itself (RunMeasuredIfAsked), started before it has read
-// anything, which runs the program with bench::RunChild.
-
-// The measuring copy's side: `--run-measured PROGRAM ARGS...` runs the program and prints
-// its figures.
-bool RunMeasuredIfAsked(int argc, char** argv) {
-    if (argc < 3 || std::strcmp(argv[1], "--run-measured") != 0)
-        return false;
-    const auto run = bench::RunChild(std::vector<std::string>(argv + 2, argv + argc));
-    if (run) {
-        std::printf("%.6f %.6f %llu %d\n", run->wallSeconds, run->processorSeconds,
-                    static_cast<unsigned long long>(run->peakBytes), run->status);
-    }
-    return true;
-}
-
-// Runs the program through a measuring copy of this benchmark.
-std::optional<ChildRun> Measure(const std::vector<std::string>& programArgs) {
-    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
-    std::string command = "'" + self + "' --run-measured";
-    for (const std::string& arg : programArgs)
-        command += " '" + arg + "'";
-    std::FILE* measuring = popen(command.c_str(), "r");
-    if (measuring == nullptr)
-        return std::nullopt;
-    ChildRun run;
-    unsigned long long peak = 0;
-    const int read = std::fscanf(measuring, "%lf %lf %llu %d", &run.wallSeconds,
-                                 &run.processorSeconds, &peak, &run.status);
-    if (pclose(measuring) != 0 || read != 4)
-        return std::nullopt;
-    run.peakBytes = peak;
-    return run;
-}
-
 void BM_VerifyEntireSchedule(benchmark::State& state) {
     for (auto _ : state) {
         const auto run =
-            Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                     fixture->installation.registryFile, "--format", "json", "--jobs", "1"});
+            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                 fixture->installation.registryFile, "--format", "json",
+                                 "--jobs", "1"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -229,7 +191,7 @@ void BM_VerifyEntireSchedule(benchmark::State& state) {
             fixture->child = run;
         fixture->childPeakBytes = std::max(fixture->childPeakBytes, run->peakBytes);
     }
-    if (const auto baseline = Measure({VTR_VERIFY_PROGRAM, "--version"}))
+    if (const auto baseline = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--version"}))
         fixture->baselinePeakBytes = baseline->peakBytes;
     if (fixture->child) {
         state.counters["cpu_ms"] = fixture->child->processorSeconds * 1e3;
@@ -242,8 +204,9 @@ BENCHMARK(BM_VerifyEntireSchedule)->UseManualTime()->Iterations(3)->Unit(benchma
 // The same verification with the sequence files loaded on every processor (the default).
 void BM_VerifyEntireScheduleEveryProcessor(benchmark::State& state) {
     for (auto _ : state) {
-        const auto run = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                  fixture->installation.registryFile, "--format", "json"});
+        const auto run = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                              fixture->installation.registryFile, "--format",
+                                              "json"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -271,10 +234,10 @@ void BM_PeakPerChannel(benchmark::State& state) {
     const auto smaller = Install("small", small);
     const auto larger = Install("large", large);
     for (auto _ : state) {
-        const auto a = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                smaller.registryFile, "--format", "json"});
-        const auto b = Measure({VTR_VERIFY_PROGRAM, "--schedule", "--registry", larger.registryFile,
-                                "--format", "json"});
+        const auto a = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                            smaller.registryFile, "--format", "json"});
+        const auto b = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                            larger.registryFile, "--format", "json"});
         if (!a || !b) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -290,12 +253,6 @@ void BM_PeakPerChannel(benchmark::State& state) {
     }
 }
 BENCHMARK(BM_PeakPerChannel)->UseManualTime()->Iterations(1)->Unit(benchmark::kMillisecond);
-
-#else
-
-bool RunMeasuredIfAsked(int, char**) {
-    return false;
-}
 
 #endif
 
@@ -425,7 +382,7 @@ std::string Milliseconds(double a, double b) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    if (RunMeasuredIfAsked(argc, argv))
+    if (bench::RunMeasuredIfAsked(argc, argv))
         return 0;
     TakeSizeOptions(argc, argv);
     benchmark::Initialize(&argc, argv);

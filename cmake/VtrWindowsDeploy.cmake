@@ -5,6 +5,8 @@
 # Included by VtrPackaging.cmake; sets VTR_WINDOWS_HELP_FILE.
 
 if(TARGET vantori-verifier)
+    # Qt's imported targets (and its plugins') are seen only where Qt was found.
+    find_package(Qt6 REQUIRED COMPONENTS Widgets)
     install(FILES $<TARGET_FILE:Qt6::Core> $<TARGET_FILE:Qt6::Gui> $<TARGET_FILE:Qt6::Widgets>
             DESTINATION .)
     install(FILES $<TARGET_FILE:Qt6::QWindowsIntegrationPlugin> DESTINATION platforms)

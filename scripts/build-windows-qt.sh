@@ -56,6 +56,9 @@ features=(
     # What the window does not use.
     sql network dbus printsupport concurrent xml opengl dynamicgl vulkan direct2d
     jpeg gif icu zstd
+    # Without direct2d, Gui leaves out the DirectWrite 3 font database that the Windows
+    # platform plugin would still ask for (it then fails to link); the plugin uses FreeType.
+    directwrite3
     # Debian's source has no tablet headers of Windows.
     tabletevent
 )

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <chrono>
+#include <cstdio>
+#include <cstring>
+#include <filesystem>
 
 #if defined(__unix__)
 #include <fcntl.h>
@@ -46,10 +49,47 @@ std::optional<ChildRun> RunChild(const std::vector<std::string>& args) {
     return run;
 }
 
+bool RunMeasuredIfAsked(int argc, char** argv) {
+    if (argc < 3 || std::strcmp(argv[1], "--run-measured") != 0)
+        return false;
+    const auto run = RunChild(std::vector<std::string>(argv + 2, argv + argc));
+    if (run) {
+        std::printf("%.6f %.6f %llu %d\n", run->wallSeconds, run->processorSeconds,
+                    static_cast<unsigned long long>(run->peakBytes), run->status);
+    }
+    return true;
+}
+
+std::optional<ChildRun> MeasureChild(const std::vector<std::string>& programArgs) {
+    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
+    std::string command = "'" + self + "' --run-measured";
+    for (const std::string& arg : programArgs)
+        command += " '" + arg + "'";
+    std::FILE* measuring = popen(command.c_str(), "r");
+    if (measuring == nullptr)
+        return std::nullopt;
+    ChildRun run;
+    unsigned long long peak = 0;
+    const int read = std::fscanf(measuring, "%lf %lf %llu %d", &run.wallSeconds,
+                                 &run.processorSeconds, &peak, &run.status);
+    if (pclose(measuring) != 0 || read != 4)
+        return std::nullopt;
+    run.peakBytes = peak;
+    return run;
+}
+
 #else
 
 std::optional<ChildRun> RunChild(const std::vector<std::string>&) {
     return std::nullopt;
+}
+
+std::optional<ChildRun> MeasureChild(const std::vector<std::string>&) {
+    return std::nullopt;
+}
+
+bool RunMeasuredIfAsked(int, char**) {
+    return false;
 }
 
 #endif

@@ -546,10 +546,14 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
     if (auto cached = state.sequenceCache.find(fileName); cached != state.sequenceCache.end())
         return cached->second;
 
+    if (state.cancelled && state.verifying)
+        return nullptr;  // a cancelled run loads nothing more
+
     ++state.loadCounts.sequenceLoads;
     state.RecordRead(fileName);
     std::shared_ptr<seqlib::Sequence> sequence;
     std::string failure;
+    bool failed = false;
     std::optional<SequencePrefetch::Load> loaded;
     if (state.prefetch)
         loaded = state.prefetch->Take(fileName);
@@ -558,17 +562,23 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
         for (const int32_t percent : loaded->progress)
             SequenceLoader::TellProgress(fileName, percent);
         sequence = std::move(loaded->sequence);
-        if (loaded->failure)
+        if (loaded->failure) {
+            failed = true;
             failure = DescribeException(loaded->failure);
+        }
     } else {
         try {
             SequenceLoader loader;
             sequence = loader.Load(fileName);
         } catch (...) {
             sequence = nullptr;
+            failed = true;
             failure = DescribeException(std::current_exception());
         }
     }
+    // A load stopped by a cancellation says nothing of the file: neither kept nor told.
+    if (!sequence && !failed)
+        return nullptr;
     // Kept even when empty: a file that cannot be loaded is not tried again in this run.
     ResumeStep([&] { state.sequenceCache.emplace(fileName, sequence); });
     if (!failure.empty())

@@ -111,7 +111,8 @@ bool IsCancelled();
 // Queues a check unless cancelled or a check with the same identifier is queued or done.
 // Never throws: a check whose identifier cannot be worked out is not queued.
 void AddCheck(CheckPtr check) noexcept;
-// The sequence of that file, loaded once per run; nullptr when it cannot be loaded.
+// The sequence of that file, loaded once per run; nullptr when it cannot be loaded, or when
+// the run is cancelled before it is loaded (which is not kept as a failure).
 std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName);
 // The show of that file, parsed once per run (failures are not kept); nullptr on failure.
 std::shared_ptr<Show> LoadShow(const std::string& fileName);

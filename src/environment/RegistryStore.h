@@ -190,7 +190,7 @@ std::unique_ptr<Backend> OpenFileStore(const std::string& path);
 // The current user's hive of the Windows registry. Its writers (of this program) lock the
 // file WindowsRegistryLockFile() names for their changes.
 std::unique_ptr<Backend> OpenWindowsRegistry();
-// %LOCALAPPDATA%\Vantori\registry.lock (APPDATA, then TEMP, when that is not set).
+// StoreFile::LockFolder()\registry.lock: %LOCALAPPDATA%\Vantori\registry.lock as a rule.
 std::string WindowsRegistryLockFile();
 #endif
 

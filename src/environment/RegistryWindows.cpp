@@ -170,13 +170,7 @@ std::unique_ptr<Backend> OpenWindowsRegistry() {
 }
 
 std::string WindowsRegistryLockFile() {
-    namespace fs = std::filesystem;
-    for (const char* name : {"LOCALAPPDATA", "APPDATA", "TEMP"}) {
-        const char* folder = std::getenv(name);
-        if (folder != nullptr && *folder != '\0')
-            return (fs::path(folder) / "Vantori" / "registry.lock").string();
-    }
-    return "registry.lock";
+    return (std::filesystem::path(StoreFile::LockFolder()) / "registry.lock").string();
 }
 
 }  // namespace vtr::RegistryStore

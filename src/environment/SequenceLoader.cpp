@@ -9,10 +9,27 @@ SequenceLoader::~SequenceLoader() {
     sequence_ = nullptr;
 }
 
+namespace {
+
+// The verification under way was cancelled (the flag outlives its run).
+bool RunCancelled() {
+    return LibVerify::IsVerifying() && LibVerify::IsCancelled();
+}
+
+}  // namespace
+
 std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileName) {
+    if (RunCancelled())
+        return nullptr;
     fileName_ = fileName;
     sequence_ = std::make_shared<seqlib::Sequence>();
-    sequence_->Load(fileName, [this](int32_t percent) { OnProgress(percent); });
+    seqlib::LoadOptions options;
+    options.keepGoing = [this] { return KeepGoing(); };
+    options.pollInterval = kPumpInterval;
+    if (!sequence_->Load(
+            fileName, [this](int32_t percent) { OnProgress(percent); }, options)) {
+        return nullptr;
+    }
     return sequence_;
 }
 
@@ -23,6 +40,16 @@ void SequenceLoader::OnProgress(int32_t percent) {
 void SequenceLoader::TellProgress(const std::string& fileName, int32_t percent) {
     LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName);
     LibVerify::ProcessPendingEvents();
+    justPumped_ = true;
+}
+
+// Asked after each percent (whose text has just let the user interface in) and after
+// kPumpInterval of work without one.
+bool SequenceLoader::KeepGoing() {
+    if (!justPumped_)
+        LibVerify::ProcessPendingEvents();
+    justPumped_ = false;
+    return !RunCancelled();
 }
 
 }  // namespace vtr

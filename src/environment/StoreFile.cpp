@@ -1,6 +1,8 @@
 #include "environment/StoreFile.h"
 
 #include <algorithm>
+#include <cstdio>
+#include <cstdlib>
 #include <filesystem>
 #include <system_error>
 #include <vector>
@@ -135,11 +137,76 @@ ReadOutcome ReadAll(const std::string& path, std::string& bytes, Stamp& stamp) {
     return ok ? ReadOutcome::Read : ReadOutcome::Failed;
 }
 
+namespace {
+
+// The path as the file system resolves it: the longest part that exists is named by the
+// system (links, short names and letter case as stored), the rest is appended as given; all
+// of it case-folded, since names differing in case name one file.
+std::wstring ResolvedPath(const std::string& path) {
+    std::error_code error;
+    fs::path existing = fs::absolute(fs::path(path), error).lexically_normal();
+    if (error)
+        existing = fs::path(path).lexically_normal();
+    std::vector<fs::path> missing;
+    while (!fs::exists(existing, error) && existing.has_relative_path()) {
+        missing.push_back(existing.filename());
+        existing = existing.parent_path();
+    }
+    std::wstring resolved = existing.wstring();
+    HANDLE handle =
+        CreateFileW(resolved.c_str(), 0, FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
+                    nullptr, OPEN_EXISTING, FILE_FLAG_BACKUP_SEMANTICS, nullptr);
+    if (handle != INVALID_HANDLE_VALUE) {
+        std::wstring name(MAX_PATH, L'\0');
+        DWORD length =
+            GetFinalPathNameByHandleW(handle, name.data(), static_cast<DWORD>(name.size()), 0);
+        if (length >= name.size()) {
+            name.resize(length);
+            length =
+                GetFinalPathNameByHandleW(handle, name.data(), static_cast<DWORD>(name.size()), 0);
+        }
+        if (length > 0 && length < name.size())
+            resolved.assign(name.data(), length);
+        CloseHandle(handle);
+    }
+    for (auto part = missing.rbegin(); part != missing.rend(); ++part) {
+        if (!resolved.empty() && resolved.back() != L'\\')
+            resolved += L'\\';
+        resolved += part->wstring();
+    }
+    if (!resolved.empty())
+        CharLowerBuffW(resolved.data(), static_cast<DWORD>(resolved.size()));
+    return resolved;
+}
+
+}  // namespace
+
+std::string LockFolder() {
+    for (const char* name : {"LOCALAPPDATA", "APPDATA", "TEMP"}) {
+        const char* folder = std::getenv(name);
+        if (folder != nullptr && *folder != '\0')
+            return (fs::path(folder) / "Vantori").string();
+    }
+    std::error_code error;
+    return (fs::temp_directory_path(error) / "Vantori").string();
+}
+
+std::string LockFileOf(const std::string& storePath) {
+    // 64-bit FNV-1a over the resolved path's UTF-16 units.
+    uint64_t hash = 14695981039346656037ull;
+    for (wchar_t unit : ResolvedPath(storePath)) {
+        for (int byte = 0; byte < 2; ++byte) {
+            hash ^= (static_cast<uint64_t>(unit) >> (8 * byte)) & 0xFF;
+            hash *= 1099511628211ull;
+        }
+    }
+    char name[40];
+    std::snprintf(name, sizeof name, "store-%016llx.lock", static_cast<unsigned long long>(hash));
+    return (fs::path(LockFolder()) / "locks" / name).string();
+}
+
 Lock::Lock(const std::string& path, On on) {
-    std::string lockFile = path;
-    if (on == On::StoreFile)
-        lockFile = (fs::path(FolderOf(path)) / ("." + fs::path(path).filename().string() + ".lock"))
-                       .string();
+    const std::string lockFile = on == On::StoreFile ? LockFileOf(path) : path;
     std::error_code ignored;
     fs::create_directories(FolderOf(lockFile), ignored);
     HANDLE file = CreateFileA(lockFile.c_str(), GENERIC_READ | GENERIC_WRITE,
@@ -149,8 +216,6 @@ Lock::Lock(const std::string& path, On on) {
         error_ = static_cast<int>(GetLastError());
         return;
     }
-    if (on == On::StoreFile && GetLastError() != ERROR_ALREADY_EXISTS)
-        SetFileAttributesA(lockFile.c_str(), FILE_ATTRIBUTE_HIDDEN);
     file_ = file;
     OVERLAPPED whole = {};
     held_ = LockFileEx(file, LOCKFILE_EXCLUSIVE_LOCK, 0, MAXDWORD, MAXDWORD, &whole) != 0;

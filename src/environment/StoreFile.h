@@ -36,12 +36,26 @@ std::string WriteTarget(const std::string& path);
 // The lock that writers of a store hold for the whole of a change (reading the store,
 // changing it, replacing it): a lock of the operating system, which is released when its
 // holder ends however it ends, so nothing has to be cleaned up after a writer that was killed.
+// Nothing is ever created in the store's folder for it.
 //   - On a store file: on POSIX the store's folder itself is locked (flock), which is never
-//     replaced, so nothing is created for the lock; on Windows a hidden file beside the store,
-//     "." followed by the store file's name and ".lock", is locked (LockFileEx) and stays.
+//     replaced, so nothing is created for the lock. On Windows a lock file of this program's
+//     own is locked (LockFileEx): LockFileOf(the store file), in the user's local
+//     application data; it is created, with its folder, when missing and is never deleted
+//     (deleting it could let a second writer lock a new file while the first holds the old).
 //   - On a lock file of its own (the Windows registry's writers use one in the user's
 //     profile): that file is locked; it is created, with its folder, when missing.
 // Waits while another process (or another lock object of this one) holds it.
+#ifdef _WIN32
+// The folder of this program's lock files: %LOCALAPPDATA%\Vantori (APPDATA, then TEMP, then
+// the system's temporary folder, when that is not set).
+std::string LockFolder();
+// The lock file of a store file: LockFolder()\locks\store-<16 hex digits>.lock, the digits
+// a hash of the store's full path as the file system resolves it (the part that exists named
+// by the system, all of it case-folded), so that every name of one store file (relative,
+// other letter case, short names, through a link to its folder) gives the same lock file.
+std::string LockFileOf(const std::string& storePath);
+#endif
+
 class Lock {
   public:
     enum class On { StoreFile, LockFile };

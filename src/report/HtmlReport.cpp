@@ -567,14 +567,14 @@ class Page {
             classes += " fp";
         if (block.toNextDay)
             classes += " tn";
-        const std::string title = std::string(FileName(block.show)) + ", " + block.times + ": " +
-                                  StateText(state) + "\n" + block.show;
+        const std::string title = Html(FileName(block.show)) + ", " + OwnHtml(block.times) + ": " +
+                                  OwnHtml(StateText(state)) + "\n" + Html(block.show);
         const bool link = !state.anchor.empty();
         out_ += link ? "<a" : "<span";
         out_ += " class=\"" + classes + "\" style=\"left:" + Percent(block.from) +
                 ";width:" + Percent(block.to - block.from) + "\" data-show=\"" + Html(block.show) +
                 "\" data-from=\"" + std::to_string(block.from) + "\" data-to=\"" +
-                std::to_string(block.to) + "\" title=\"" + Html(title) + "\"";
+                std::to_string(block.to) + "\" title=\"" + title + "\"";
         if (link)
             out_ += " href=\"#" + state.anchor + "\"";
         out_ += ">";
@@ -587,7 +587,7 @@ class Page {
             out_ += "\u2190 ";
         out_ += Html(Stem(block.show));
         if (!small)
-            out_ += " " + Html(block.times);
+            out_ += " " + OwnHtml(block.times);
         if (block.toNextDay)
             out_ += " \u2192";
         out_ += link ? "</a>" : "</span>";
@@ -732,7 +732,7 @@ class Page {
                 std::string when;
                 for (const std::string& text : plays->second)
                     when += (when.empty() ? "" : "; ") + text;
-                out_ += "<p class=\"note\">Plays " + Html(when) + "</p>";
+                out_ += "<p class=\"note\">Plays " + OwnHtml(when) + "</p>";
             }
         } else if (section.kind == Section::Kind::Sequence) {
             if (const auto* players = arrangement_.PlayedBy(section.path)) {

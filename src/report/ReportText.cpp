@@ -85,7 +85,11 @@ std::string DisplayText(std::string_view bytes) {
 }
 
 std::string Html(std::string_view bytes) {
-    const std::string text = DisplayText(bytes);
+    return OwnHtml(DisplayText(bytes));
+}
+
+std::string OwnHtml(std::string_view utf8) {
+    const std::string text = ValidUtf8(utf8);
     std::string out;
     out.reserve(text.size() + text.size() / 8);
     for (const char c : text) {

@@ -20,6 +20,11 @@ std::string ValidUtf8(std::string_view bytes);
 // content and in a quoted attribute value.
 std::string Html(std::string_view bytes);
 
+// Text the program writes itself, UTF-8 on every system (times with their dashes, counts),
+// with the same five characters written as character references. Text of the suite's files
+// goes through Html instead, which converts it from the ANSI code page on Windows.
+std::string OwnHtml(std::string_view utf8);
+
 // A file URI for a path, absolute or not as given:
 //   /home/ann/Shows/Evening.lss   file:///home/ann/Shows/Evening.lss
 //   C:\Shows\Evening.lss           file:///C:/Shows/Evening.lss

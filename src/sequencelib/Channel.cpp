@@ -33,15 +33,16 @@ Channel::SettingsId Channel::SettingsIdentity() const {
 }
 
 std::size_t Channel::SettingsIdHash::operator()(const SettingsId& id) const noexcept {
-    // The four parts packed into two words and mixed (the finaliser of splitmix64).
-    const uint64_t high =
-        (uint64_t{static_cast<uint32_t>(id.type)} << 32) | static_cast<uint32_t>(id.network);
-    const uint64_t low =
-        (uint64_t{static_cast<uint32_t>(id.unit)} << 32) | static_cast<uint32_t>(id.circuit);
-    uint64_t x = high ^ (low * 0x9E3779B97F4A7C15ull);
+    // The device (type, network and unit, mixed by the finaliser of splitmix64) plus the
+    // circuit: neighbouring circuits of one device, which sequences usually list in a row,
+    // land side by side in a table, while devices scatter.
+    uint64_t x =
+        ((uint64_t{static_cast<uint32_t>(id.type)} << 32) | static_cast<uint32_t>(id.network)) ^
+        (uint64_t{static_cast<uint32_t>(id.unit)} * 0x9E3779B97F4A7C15ull);
     x = (x ^ (x >> 30)) * 0xBF58476D1CE4E5B9ull;
     x = (x ^ (x >> 27)) * 0x94D049BB133111EBull;
-    return static_cast<std::size_t>(x ^ (x >> 31));
+    x ^= x >> 31;
+    return static_cast<std::size_t>(x + static_cast<uint32_t>(id.circuit));
 }
 
 }  // namespace vtr::seqlib

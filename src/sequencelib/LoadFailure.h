@@ -16,6 +16,11 @@ struct LoadFailure {
     throw LoadFailure{std::move(where), std::move(cause)};
 }
 
+// Not a failure: the caller asked the load to stop (a cancelled verification). It unwinds
+// the load like a failure and is turned back into a plain "stopped" answer at the public
+// entry point, never into an error.
+struct LoadStopped {};
+
 // "2 GiB", "64 MiB", "1000 bytes": a byte count for messages.
 std::string ByteCountText(unsigned long long bytes);
 

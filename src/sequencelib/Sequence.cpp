@@ -6,10 +6,12 @@
 #include <limits>
 #include <new>
 #include <string_view>
-#include <unordered_map>
+#include <utility>
 
 #include "engine/VtrError.h"
 #include "sequencelib/ByteSource.h"
+#include "sequencelib/FlatMap.h"
+#include "sequencelib/LoadClock.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/XmlPieceReader.h"
 
@@ -69,8 +71,9 @@ struct ChannelIdHash {
 // with their channel references (resolved once every channel is known), intensity files.
 class SequenceBuilder final : public detail::XmlPieceHandler {
   public:
-    SequenceBuilder(Sequence& sequence, const detail::XmlPieceReader& reader)
-        : sequence_(sequence), reader_(reader) {}
+    SequenceBuilder(Sequence& sequence, const detail::XmlPieceReader& reader,
+                    std::uint64_t maxKeptBytes)
+        : sequence_(sequence), reader_(reader), maxKept_(maxKeptBytes) {}
 
     void EnterElement(const pugi::xml_node& startTag) override {
         const Context parent = stack_.empty() ? Context::Document : stack_.back();
@@ -115,14 +118,15 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::TextPlace place;
     };
 
-    // The name equals the literal (compared up to and with its terminating NUL).
+    // The name equals the literal (compared up to and with its terminating NUL, a byte at a
+    // time so that nothing past a shorter name is read; unrolled for the literal at hand).
     template <std::size_t N>
     static bool Is(const char* name, const char (&literal)[N]) {
-        for (std::size_t i = 0; i < N; ++i) {
-            if (name[i] != literal[i])
-                return false;
-        }
-        return true;
+        return IsEach(name, literal, std::make_index_sequence<N>{});
+    }
+    template <std::size_t N, std::size_t... I>
+    static bool IsEach(const char* name, const char (&literal)[N], std::index_sequence<I...>) {
+        return ((name[I] == literal[I]) && ...);
     }
 
     void Walk(Context parent, const pugi::xml_node& element) {
@@ -209,10 +213,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         const auto& channels = sequence_.Channels();
         std::size_t index = lastFound_ + lastStride_;
         if (index >= channels.size() || channels[index]->Id() != id) {
-            const auto found = indexById_.find(id);
-            if (found == indexById_.end())
+            const std::size_t* found = indexById_.Find(id);
+            if (found == nullptr)
                 return kNoChannel;
-            index = found->second;
+            index = *found;
         }
         lastStride_ = index > lastFound_ ? index - lastFound_ : 1;
         lastFound_ = index;
@@ -228,41 +232,52 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::FailLoad(detail::PlaceText(reader_.PlaceOf(attribute)), std::move(cause));
     }
 
+    // Counts what the sequence keeps for the element: however far a file's text expands, the
+    // loader keeps no more than maxKeptBytes of it.
+    void Keep(std::size_t bytes, const pugi::xml_node& element) {
+        kept_ += bytes;
+        if (kept_ > maxKept_)
+            FailKept(element);
+    }
+    [[noreturn]] void FailKept(const pugi::xml_node& element) const;
+
     // Marks a known attribute as read; a second one of the same name is refused.
     void Once(unsigned& seen, unsigned bit, const pugi::xml_attribute& attribute,
               const char* element) const {
-        if ((seen & bit) != 0) {
-            Fail(attribute, std::string("the attribute ") + attribute.name() + " of <" + element +
-                                "> is repeated");
-        }
+        if ((seen & bit) != 0)
+            FailRepeated(attribute, element);
         seen |= bit;
     }
+    [[noreturn]] void FailRepeated(const pugi::xml_attribute& attribute, const char* element) const;
 
+    // The attribute's whole number, which must lie in [min, max].
     int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
                   int64_t max) const {
-        // Digits, with a minus sign in front for a negative number; nothing else.
-        const char* text = attribute.value();
-        const char* p = text;
-        const bool negative = *p == '-';
-        if (negative)
-            ++p;
         int64_t value = 0;
-        bool valid = *p != '\0';
-        for (; *p != '\0'; ++p) {
-            if (*p < '0' || *p > '9' || value > (INT64_MAX - 9) / 10) {
-                valid = false;
-                break;
-            }
-            value = value * 10 + (*p - '0');
-        }
-        if (negative)
-            value = -value;
-        if (!valid || value < min || value > max) {
-            Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + text +
-                                "\" of <" + element + "> is not a whole number from " +
-                                std::to_string(min) + " to " + std::to_string(max));
-        }
+        if (!ReadWhole(attribute.value(), value) || value < min || value > max)
+            FailNumber(attribute, element, min, max);
         return value;
+    }
+    [[noreturn]] void FailNumber(const pugi::xml_attribute& attribute, const char* element,
+                                 int64_t min, int64_t max) const;
+
+    // Digits, with a minus sign in front for a negative number; nothing else. Leading zeros
+    // count for nothing; every range is within 32 bits, so a number of more than fifteen
+    // digits after them is out of it and is not read on.
+    static bool ReadWhole(const char* text, int64_t& value) {
+        const bool negative = *text == '-';
+        const char* p = text + (negative ? 1 : 0);
+        const char* const digits = p;
+        while (*p == '0')
+            ++p;
+        const char* const significant = p;
+        int64_t read = 0;
+        for (unsigned digit;
+             (digit = static_cast<unsigned char>(*p) - 0x30u) <= 9 && p - significant < 15; ++p) {
+            read = read * 10 + digit;
+        }
+        value = negative ? -read : read;
+        return *p == '\0' && p != digits;
     }
 
     static constexpr int64_t kLongMax = std::numeric_limits<int32_t>::max();
@@ -328,8 +343,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
         if (!idAttribute || *idAttribute.value() == '\0')
             Fail(element, "the <channel> has no id");
+        Keep(kChannelBytes + name.size() + subsequence.size() + std::strlen(idAttribute.value()),
+             element);
         auto channel = std::make_shared<Channel>(idAttribute.value());
-        if (!indexById_.try_emplace(std::string_view(channel->Id()), sequence_.Channels().size())
+        if (!indexById_.Insert(std::string_view(channel->Id()), sequence_.Channels().size())
                  .second) {
             Fail(idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
         }
@@ -394,6 +411,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     }
 
     void BeginTrack(const pugi::xml_node& element) {
+        Keep(kTrackBytes, element);
         auto track = std::make_shared<Track>();
         track->SetLength(sequence_.Length());
         unsigned seen = 0;
@@ -415,11 +433,13 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     void ReadChannelRef(const pugi::xml_node& element) {
         const pugi::xml_attribute idAttribute = element.attribute("id");
         const std::string_view id = idAttribute.value();
+        Keep(sizeof(std::shared_ptr<Channel>), element);
         if (const std::size_t index = FindChannel(id); index != kNoChannel) {
             track_->AddChannel(sequence_.Channels()[index]);
             return;
         }
         // Perhaps a channel further on: resolved when the file is read.
+        Keep(sizeof(PendingReference) + id.size(), element);
         pending_.push_back(
             {track_, track_->channels_.size(), std::string(id), reader_.PlaceOf(element)});
         track_->channels_.push_back(nullptr);
@@ -439,6 +459,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
             Fail(element, std::string("a second ") + IntensityFileKindName(fileKind) +
                               " intensity file (a sequence has at most one of each kind)");
         }
+        Keep(kIntensityFileBytes, element);
         auto file = std::make_shared<IntensityFile>(fileKind, element.attribute("name").value());
         intensityFile_ = file.get();
         sequence_.SetIntensityFile(std::move(file), trackIndex_);
@@ -467,6 +488,7 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                 count = Whole(a, "device", 0, kIntegerMax);
             }
         }
+        Keep(sizeof(DeviceAddress), element);
         intensityFile_->AddDevice(DeviceAddress(
             static_cast<int32_t>(deviceType), static_cast<int32_t>(network),
             static_cast<uint8_t>(unit), static_cast<int16_t>(start), static_cast<int16_t>(count)));
@@ -475,8 +497,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     Sequence& sequence_;
     const detail::XmlPieceReader& reader_;
     std::vector<Context> stack_;
-    // Each channel's index in the sequence, by id.
-    std::unordered_map<std::string_view, std::size_t, ChannelIdHash> indexById_;
+    // Each channel's index in the sequence, by id (viewing the channel's own copy).
+    FlatMap<std::string_view, std::size_t, ChannelIdHash> indexById_;
     std::size_t lastFound_ = 0;
     std::size_t lastStride_ = 1;
     Channel* channel_ = nullptr;
@@ -484,7 +506,35 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     int32_t trackIndex_ = -1;
     IntensityFile* intensityFile_ = nullptr;
     std::vector<PendingReference> pending_;
+    std::uint64_t maxKept_;
+    std::uint64_t kept_ = 0;
+
+    // What an object costs besides its texts: the object, its control block, its place in the
+    // sequence's list (and for a channel, its place in the index of ids).
+    static constexpr std::size_t kChannelBytes = sizeof(Channel) + 64;
+    static constexpr std::size_t kTrackBytes = sizeof(Track) + 48;
+    static constexpr std::size_t kIntensityFileBytes = sizeof(IntensityFile) + 32;
 };
+
+void SequenceBuilder::FailKept(const pugi::xml_node& element) const {
+    Fail(element,
+         "the sequence holds more channels, tracks and intensity-file devices than fit "
+         "in " +
+             detail::ByteCountText(maxKept_));
+}
+
+void SequenceBuilder::FailRepeated(const pugi::xml_attribute& attribute,
+                                   const char* element) const {
+    Fail(attribute,
+         std::string("the attribute ") + attribute.name() + " of <" + element + "> is repeated");
+}
+
+void SequenceBuilder::FailNumber(const pugi::xml_attribute& attribute, const char* element,
+                                 int64_t min, int64_t max) const {
+    Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + attribute.value() +
+                        "\" of <" + element + "> is not a whole number from " +
+                        std::to_string(min) + " to " + std::to_string(max));
+}
 
 namespace {
 
@@ -497,22 +547,31 @@ std::string LoadErrorText(const std::string& fileName, const detail::LoadFailure
 
 }  // namespace
 
-void Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
+bool Sequence::Load(const std::string& fileName, const ProgressCallback& progress,
                     const LoadOptions& options) {
     Sequence loaded;
     loaded.fileName_ = fileName;
     try {
+        detail::LoadClock clock(options.keepGoing, options.pollInterval);
         const auto source = detail::OpenDecodedFile(fileName, options.maxExpandedBytes);
         int32_t told = -1;
+        // The caller may have let its user cancel while it was told (a load that is done
+        // stays done).
         const auto tell = [&](int32_t percent) {
             if (progress && percent > told) {
                 told = percent;
                 progress(percent);
+                if (percent < 100)
+                    clock.Ask();
             }
         };
         tell(0);
-        detail::XmlPieceReader reader(*source, options.pieceBytes);
-        SequenceBuilder builder(loaded, reader);
+        detail::XmlPieceReader::Options readerOptions;
+        readerOptions.pieceBytes = options.pieceBytes;
+        readerOptions.maxDepth = options.maxDepth;
+        readerOptions.tick = [&clock] { clock.Tick(); };
+        detail::XmlPieceReader reader(*source, std::move(readerOptions));
+        SequenceBuilder builder(loaded, reader, options.maxKeptBytes);
         reader.Run(builder, [&] {
             const std::uint64_t total = source->FileBytesTotal();
             if (total == 0)
@@ -522,6 +581,8 @@ void Sequence::Load(const std::string& fileName, const ProgressCallback& progres
         });
         builder.Finish();
         tell(100);
+    } catch (const detail::LoadStopped&) {
+        return false;
     } catch (const detail::LoadFailure& failure) {
         Raise(ErrorNumbers::UserMessage, "Sequence.Load", LoadErrorText(fileName, failure));
     } catch (const std::bad_alloc&) {
@@ -529,6 +590,7 @@ void Sequence::Load(const std::string& fileName, const ProgressCallback& progres
               LoadErrorText(fileName, {{}, "not enough memory to load it"}));
     }
     *this = std::move(loaded);
+    return true;
 }
 
 }  // namespace vtr::seqlib

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
@@ -19,12 +20,31 @@ using ProgressCallback = std::function<void(int32_t percent)>;
 // The most a compressed sequence may expand to; a larger one is refused.
 inline constexpr std::uint64_t kMaxExpandedBytes = std::uint64_t{2} << 30;
 
+// The deepest nesting of elements a sequence file may have (the sequence element is at 1;
+// the suite's own files never go past 4).
+inline constexpr int32_t kMaxNestingDepth = 100000;
+
+// The most memory a loaded sequence may keep for its channels, tracks and intensity files
+// (a channel costs some 200 bytes: five million channels fit).
+inline constexpr std::uint64_t kMaxKeptBytes = std::uint64_t{1} << 30;
+
+// How a load reads and when it stops. Each load has its own: loads of different sequences
+// may run on different threads at once, each calling back on its own thread.
 struct LoadOptions {
     // How much of the file is parsed at a time. The loader never holds the parse tree of
     // more than about this much text, whatever the file's size.
     std::size_t pieceBytes = std::size_t{1} << 20;
     // Decompressed data beyond this is refused.
     std::uint64_t maxExpandedBytes = kMaxExpandedBytes;
+    // Elements nested deeper than this are refused.
+    int32_t maxDepth = kMaxNestingDepth;
+    // A sequence that would keep more than this is refused as it is read, however small its
+    // file (compressed text of a few megabytes can hold hundreds of millions of elements).
+    std::uint64_t maxKeptBytes = kMaxKeptBytes;
+    // Asked as the load goes, after each percent told and at least once per pollInterval
+    // of work in between (the loading thread's processor time): false stops the load.
+    std::function<bool()> keepGoing;
+    std::chrono::milliseconds pollInterval{50};
 };
 
 // A sequence ("lms" musical or "las" animation file, plain or gzip-compressed): its
@@ -32,10 +52,11 @@ struct LoadOptions {
 // command. It keeps what the checks ask about, not the events.
 class Sequence {
   public:
-    // Reads the file. Raises VtrError (number 37, source "Sequence.Load") naming the file,
-    // the place in it and the cause when the file cannot be loaded; the sequence is then
-    // left as it was.
-    void Load(const std::string& fileName, const ProgressCallback& progress = {},
+    // Reads the file; true once it is loaded. Raises VtrError (number 37, source
+    // "Sequence.Load") naming the file, the place in it and the cause when the file cannot
+    // be loaded. False when options.keepGoing stopped the load, which says nothing of the
+    // file. Either way the sequence is left as it was.
+    bool Load(const std::string& fileName, const ProgressCallback& progress = {},
               const LoadOptions& options = {});
 
     // The file last loaded ("" for a sequence built in memory).

@@ -90,13 +90,17 @@ TargetKind KindOfFile(const QString& path) {
 // A target file as the window verifies and remembers it: absolute, relative names taken from
 // the working folder, "." and ".." resolved, in the system's own notation. The results name
 // the file this way, and so does the key that ignores one of them, wherever the window is
-// opened next. Empty stays empty.
+// opened next. Away from Windows, a name typed from the home folder ("~/shows/Evening.lss")
+// is taken from there, as the shell would. Empty stays empty.
 QString AbsoluteTarget(const QString& path) {
-    QString trimmed = path.trimmed();
-    if (trimmed.isEmpty())
-        return trimmed;
-    return QDir::toNativeSeparators(
-        QDir::cleanPath(QDir::current().absoluteFilePath(QDir::fromNativeSeparators(trimmed))));
+    QString name = QDir::fromNativeSeparators(path.trimmed());
+    if (name.isEmpty())
+        return name;
+#ifndef Q_OS_WIN
+    if (name == QLatin1String("~") || name.startsWith(QLatin1String("~/")))
+        name = QDir::homePath() + name.mid(1);
+#endif
+    return QDir::toNativeSeparators(QDir::cleanPath(QDir::current().absoluteFilePath(name)));
 }
 
 // Whether two queries show a listing alike: the same filter, order and grouping.

@@ -8,6 +8,8 @@
 #include <QCommandLineOption>
 #include <QCommandLineParser>
 #include <QMessageBox>
+#include <cstdio>
+#include <cstring>
 #include <exception>
 #include <optional>
 
@@ -60,11 +62,41 @@ void AnswerHelpAndVersion(int argc, char** argv) {
         commandLine.parser.showVersion();
 }
 
+// Where the window would open on X11 or Wayland, with neither a display named nor another
+// platform chosen, the window system cannot start: say so and how to verify without a
+// window, instead of the window system's own abort. Elsewhere (Windows, macOS) there is
+// always a desktop.
+bool NoDisplayToOpenOn(int argc, char** argv) {
+#if defined(Q_OS_UNIX) && !defined(Q_OS_MACOS)
+    for (const char* name : {"QT_QPA_PLATFORM", "DISPLAY", "WAYLAND_DISPLAY"}) {
+        if (!qEnvironmentVariableIsEmpty(name))
+            return false;
+    }
+    for (int i = 1; i < argc; ++i) {
+        if (std::strcmp(argv[i], "-platform") == 0 || std::strcmp(argv[i], "--platform") == 0)
+            return false;
+    }
+    return true;
+#else
+    Q_UNUSED(argc);
+    Q_UNUSED(argv);
+    return false;
+#endif
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
     SetApplicationNames();
     AnswerHelpAndVersion(argc, argv);
+    if (NoDisplayToOpenOn(argc, argv)) {
+        std::fputs(
+            "vantori-verifier: there is no display to open the window on (neither DISPLAY "
+            "nor WAYLAND_DISPLAY is set).\nOn a terminal, vantori-verify verifies the "
+            "same installation without a window.\n",
+            stderr);
+        return 3;
+    }
 
     QApplication application(argc, argv);
     QApplication::setApplicationDisplayName(QStringLiteral("Vantori Verifier"));

@@ -3,7 +3,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <cctype>
 #include <chrono>
+#include <cstdlib>
 #include <filesystem>
 #include <future>
 #include <random>
@@ -31,13 +33,12 @@ using LibRegistryVTRShared::GetSharedString;
 using LibRegistryVTRShared::SetSharedString;
 using ::testing::HasSubstr;
 
-// Names in the folder other than the store file itself (and, on Windows, the file its
-// writers lock, which stays beside it).
+// Names in the folder other than the store file itself.
 std::vector<std::string> Leftovers(const std::string& folder, const std::string& storeName) {
     std::vector<std::string> names;
     for (const auto& entry : fs::directory_iterator(folder)) {
         const std::string name = entry.path().filename().string();
-        if (name != storeName && name != "tmp" && name != "." + storeName + ".lock")
+        if (name != storeName && name != "tmp")
             names.push_back(name);
     }
     return names;
@@ -207,6 +208,54 @@ TEST_F(RegistryStoreTest, AReadOnlyStoreFileIsRefusedAndLeftAsItIs) {
     EXPECT_EQ(GetSharedString("AppPath", "", ""), "/x");
     EXPECT_FALSE(RegistryStore::Describe().condition.readOnly);
 }
+
+#ifdef _WIN32
+// On Windows the store's writers lock a file in the user's local application data named after
+// the store, never one beside it: every name of one store file leads to the same lock file.
+TEST_F(RegistryStoreTest,
+       TheWritersLockFileIsInTheLocalApplicationDataAndOneForEveryNameOfTheStore) {
+    const std::string lockFile = vtr::StoreFile::LockFileOf(StoreFile());
+    const fs::path locks = fs::path(std::getenv("LOCALAPPDATA")) / "Vantori" / "locks";
+    EXPECT_EQ(fs::path(lockFile).parent_path(), locks);
+    // "store-", sixteen lower-case hexadecimal digits, ".lock" (GoogleTest's regular
+    // expressions on Windows have no character classes).
+    const std::string name = fs::path(lockFile).filename().string();
+    ASSERT_EQ(name.size(), 27u) << name;
+    EXPECT_EQ(name.substr(0, 6), "store-") << name;
+    EXPECT_EQ(name.substr(22), ".lock") << name;
+    EXPECT_EQ(name.find_first_not_of("0123456789abcdef", 6), 22u) << name;
+
+    // Missing, then created: the same lock file.
+    fs::remove(StoreFile());
+    const std::string whileMissing = vtr::StoreFile::LockFileOf(StoreFile());
+    SetSharedString("AppPath", "C:\\Vantori", "");
+    EXPECT_EQ(vtr::StoreFile::LockFileOf(StoreFile()), whileMissing);
+    EXPECT_TRUE(fs::exists(whileMissing)) << "the write locked it";
+    EXPECT_TRUE(Leftovers(folder_.Path(), "registry.reg").empty());
+
+    std::string upper = StoreFile();
+    for (char& c : upper)
+        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+    EXPECT_EQ(vtr::StoreFile::LockFileOf(upper), lockFile);
+    EXPECT_EQ(vtr::StoreFile::LockFileOf(folder_.File("tmp\\..\\registry.reg")), lockFile);
+    EXPECT_EQ(vtr::StoreFile::LockFileOf(folder_.File("tmp/../registry.reg")), lockFile);
+    EXPECT_NE(vtr::StoreFile::LockFileOf(folder_.File("other.reg")), lockFile);
+    EXPECT_NE(vtr::StoreFile::LockFileOf(folder_.File("tmp\\registry.reg")), lockFile);
+
+    // Held under one name, the store is locked under the other.
+    std::future<bool> other;
+    {
+        vtr::StoreFile::Lock held(StoreFile(), vtr::StoreFile::Lock::On::StoreFile);
+        ASSERT_TRUE(held.Held());
+        other = std::async(std::launch::async, [&upper] {
+            return vtr::StoreFile::Lock(upper, vtr::StoreFile::Lock::On::StoreFile).Held();
+        });
+        EXPECT_EQ(other.wait_for(std::chrono::milliseconds(300)), std::future_status::timeout)
+            << "a second holder while the first holds it";
+    }
+    EXPECT_TRUE(other.get());
+}
+#endif
 
 TEST_F(RegistryStoreTest, TheDescriptionSaysWhichStoreHowItWasChosenAndWhatIsWrong) {
     testsupport::ScopedStore restore(RegistryStore::OpenFileStore(StoreFile()));

@@ -3,6 +3,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <chrono>
+
 #include "SeqTestFiles.h"
 
 namespace vtr::seqlib {
@@ -327,6 +330,61 @@ TEST(SequenceLoad, AFailedLoadLeavesTheSequenceAsItWas) {
     EXPECT_EQ(s.FileName(), folder.File("good.lms"));
     EXPECT_EQ(s.Channels().size(), 3u);
     EXPECT_TRUE(std::find(told.begin(), told.end(), 100) == told.end());
+}
+
+TEST(SequenceLoad, IsAskedWhetherToGoOnBetweenPercentsAndStopsWhenTold) {
+    TempFolder folder;
+    std::string channels;
+    for (int i = 1; i <= 300; ++i) {
+        channels += "<channel id=\"" + std::to_string(i) +
+                    "\"><event start=\"0\" end=\"5\" intensity=\"7\"/></channel>\n";
+    }
+    const std::string big = folder.Write("big.lms", WithChannels(10, channels));
+    LoadOptions options;
+    options.pieceBytes = 256;
+    options.pollInterval = std::chrono::milliseconds(0);
+    int asked = 0;
+    options.keepGoing = [&] {
+        ++asked;
+        return true;
+    };
+    std::vector<int32_t> told;
+    Sequence s;
+    EXPECT_TRUE(s.Load(
+        big, [&](int32_t percent) { told.push_back(percent); }, options));
+    EXPECT_GT(asked, static_cast<int>(told.size()))
+        << "asked as the load goes, not only per percent";
+
+    s.Load(folder.Write("good.lms", kExample));
+    told.clear();
+    asked = 0;
+    options.keepGoing = [&] { return ++asked < 5; };
+    EXPECT_FALSE(s.Load(
+        big, [&](int32_t percent) { told.push_back(percent); }, options));
+    EXPECT_EQ(asked, 5) << "stops when told, and is asked no more";
+    EXPECT_EQ(s.FileName(), folder.File("good.lms")) << "the sequence is left as it was";
+    EXPECT_EQ(s.Channels().size(), 3u);
+    EXPECT_TRUE(std::find(told.begin(), told.end(), 100) == told.end());
+}
+
+// Compressed text of a few megabytes can hold millions of small elements: what a load keeps
+// of them is counted as it is read and bounded.
+TEST(SequenceLoad, WhatALoadKeepsIsBoundedAsItIsRead) {
+    TempFolder folder;
+    std::string channels;
+    for (int i = 1; i <= 1000; ++i)
+        channels += "<channel id=\"" + std::to_string(i) + "\" name=\"Channel\"/>\n";
+    const std::string path = folder.Write("many.las", Gzip(WithChannels(10, channels)));
+    LoadOptions options;
+    options.maxKeptBytes = std::uint64_t{16} << 10;
+    const std::string error = testing::ErrorOf([&] { Sequence().Load(path, {}, options); });
+    EXPECT_THAT(error, ::testing::StartsWith("Cannot load sequence file \"" + path + "\": line "));
+    EXPECT_THAT(error, ::testing::EndsWith(": the sequence holds more channels, tracks and "
+                                           "intensity-file devices than fit in 16 KiB"));
+    EXPECT_EQ(kMaxKeptBytes, std::uint64_t{1} << 30);
+    Sequence s;
+    EXPECT_TRUE(s.Load(path));
+    EXPECT_EQ(s.Channels().size(), 1000u);
 }
 
 TEST(SequenceModel, BuiltInMemoryLikeALoadedOne) {

@@ -10,6 +10,7 @@
 namespace vtr::seqlib {
 namespace {
 
+using testing::ErrorOf;
 using testing::TempFolder;
 
 // Everything a load keeps, as one text, so that two loads can be compared.
@@ -147,6 +148,64 @@ TEST(XmlPieceReader, DamagedDocumentsAreJudgedAlikeWhateverThePieces) {
         }
     }
     EXPECT_GT(refused, 100) << "the damage should break many documents";
+}
+
+// Elements the loader does not know, nested `depth` deep between two channels; inside them a
+// channel that is not the sequence's (it is not a child of <channels>).
+std::string NestedBetweenChannels(int depth) {
+    std::string text = R"(<sequence length="10"><channels><channel id="1">)"
+                       R"(<event start="0" end="5" intensity="3"/></channel>)";
+    for (int i = 0; i < depth; ++i)
+        text += "<wrap>";
+    text += R"(<channel id="inner"/>)";
+    for (int i = 0; i < depth; ++i)
+        text += "</wrap>";
+    return text + R"(<channel id="2"/></channels><tracks><track><channelRef id="2"/>)"
+                  R"(</track></tracks></sequence>)";
+}
+
+TEST(XmlPieceReader, DeepNestingReadsTheSameInEveryPieceSize) {
+    TempFolder folder;
+    const std::string path = folder.Write("deep.lms", NestedBetweenChannels(20000));
+    const std::string whole = Outcome(path, std::size_t{1} << 20);
+    EXPECT_EQ(whole, "10||\n1,,,1,0,,on\n2,,,1,0,,off\ntrack  10: 2\n");
+    for (const std::size_t piece : {16, 64, 1000, 4096, 100000})
+        EXPECT_EQ(Outcome(path, piece), whole) << "pieces of " << piece;
+}
+
+TEST(XmlPieceReader, NestingBeyondTheLimitIsRefusedAtTheTagThatGoesTooDeep) {
+    TempFolder folder;
+    // <sequence> is at depth 1, <channels> at 2, the n-th <wrap> at 2 + n.
+    const auto load = [&](int wraps, int32_t maxDepth, std::size_t piece) {
+        LoadOptions options;
+        options.maxDepth = maxDepth;
+        options.pieceBytes = piece;
+        std::string text = "<sequence length=\"10\"><channels>";
+        for (int i = 0; i < wraps; ++i)
+            text += "<wrap>";
+        text += "<w/>";
+        for (int i = 0; i < wraps; ++i)
+            text += "</wrap>";
+        const std::string path = folder.Write("deep.lms", text + "</channels></sequence>");
+        const std::string error = ErrorOf([&] { Sequence().Load(path, {}, options); });
+        const std::string prefix = "Cannot load sequence file \"" + path + "\": ";
+        return error.rfind(prefix, 0) == 0 ? error.substr(prefix.size()) : error;
+    };
+    for (const std::size_t piece : {std::size_t{16}, std::size_t{1} << 20}) {
+        EXPECT_EQ(load(47, 50, piece), "(no error)") << piece;
+        // The empty element <w/> goes one deeper than the last <wrap>.
+        EXPECT_EQ(load(48, 50, piece),
+                  "line 1, column 321: the elements are nested more than 50 levels deep")
+            << piece;
+        EXPECT_EQ(load(49, 50, piece),
+                  "line 1, column 321: the elements are nested more than 50 levels deep")
+            << piece;
+    }
+    EXPECT_EQ(kMaxNestingDepth, 100000);
+    EXPECT_EQ(load(99997, kMaxNestingDepth, std::size_t{1} << 20), "(no error)");
+    EXPECT_EQ(load(99998, kMaxNestingDepth, std::size_t{1} << 20),
+              "line 1, column " + std::to_string(32 + 99998 * 6 + 1) +
+                  ": the elements are nested more than 100000 levels deep");
 }
 
 }  // namespace

@@ -103,6 +103,7 @@ StoreTest::StoreTest()
 #ifdef _WIN32
       ,
       tmp_("TMP", folder_.File("tmp")),
+      localAppDataVariable_("LOCALAPPDATA", localAppData_.Path()),
       mediaPlayer_(MediaPlayerProbe::StoredVersionText)
 #endif
 {

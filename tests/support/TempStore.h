@@ -90,11 +90,17 @@ class StoreTest : public ::testing::Test {
     TempFolder folder_;
 
   private:
+#ifdef _WIN32
+    // The user's local application data, where the store's writers keep their lock files
+    // (made before TMP is changed, so not inside the test's temporary folder).
+    TempFolder localAppData_;
+#endif
     std::string storeFile_;
     ScopedStore store_;
     ScopedEnvironment tmpdir_;
 #ifdef _WIN32
     ScopedEnvironment tmp_;
+    ScopedEnvironment localAppDataVariable_;
     MediaPlayerProbe::ScopedVersionSource mediaPlayer_;
 #endif
 };

@@ -196,6 +196,18 @@ void DoubleClick(QTreeView* list, const QModelIndex& row) {
     }
 }
 
+// The command line's unignore, on the store in that file.
+void UnignoreOnTheCommandLine(const std::string& store, const QStringList& what) {
+    QProcess cli;
+    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
+              QStringList{QStringLiteral("--registry"), QString::fromStdString(store),
+                          QStringLiteral("unignore")} +
+                  what);
+    QVERIFY(cli.waitForFinished(30000));
+    QCOMPARE(cli.exitStatus(), QProcess::NormalExit);
+    QCOMPARE(cli.exitCode(), 0);
+}
+
 }  // namespace
 
 class FrmVerifierTest : public QObject {
@@ -1088,33 +1100,60 @@ void FrmVerifierTest::popupActsOnTheRowUnderThePointer() {
 void FrmVerifierTest::countersFollowIgnoring() {
     const ResultPtr e1 = LibVerify::AddResult(Severity::Error, "Error one", 21, 21, {"1"});
     const ResultPtr e2 = LibVerify::AddResult(Severity::Error, "Error two", 21, 21, {"2"});
-    const ResultPtr e3 = LibVerify::AddResult(Severity::Error, "Error three", 22, 22, {"3"});
+    LibVerify::AddResult(Severity::Error, "Error three", 22, 22, {"3"});
     const ResultPtr w1 = LibVerify::AddResult(Severity::Warning, "Warning one", 5, 5, {"4"});
     const ResultPtr w2 = LibVerify::AddResult(Severity::Warning, "Warning two", 5, 5, {"5"});
     LibVerify::AddResult(Severity::Info, "Info", 1, 1);
-    auto errors = [this] { return Find<QLabel>("lblErrorsCount")->text(); };
-    auto warnings = [this] { return Find<QLabel>("lblWarningsCount")->text(); };
-    QCOMPARE(errors(), QStringLiteral("3"));
-    QCOMPARE(warnings(), QStringLiteral("2"));
+    auto* tabs = Find<QTabWidget>("sstDetails");
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QTreeView* results = Results();
+    QTreeView* ignored = Ignored();
+    auto* menu = Find<QMenu>("mnuResultPopup");
+    auto* ignoredMenu = Find<QMenu>("mnuIgnoredPopup");
+    // What the counters say, with what the list on view holds.
+    auto counters = [this] {
+        return QStringList{Find<QLabel>("lblErrorsCount")->text(),
+                           Find<QLabel>("lblWarningsCount")->text(), Shown()};
+    };
+    auto choose = [](QTreeView* list, QMenu* popup, const ResultPtr& result, const char* entry) {
+        RightClick(list, ItemOf(list, result));
+        QTRY_VERIFY(popup->isVisible());
+        ClickMenuEntry(popup, QString::fromLatin1(entry));
+        QTRY_VERIFY(!popup->isVisible());
+    };
+    QCOMPARE(counters(), (QStringList{"3", "2", "6 of 6 shown"}));
 
-    window_->IgnoreResult(e2);
-    QCOMPARE(errors(), QStringLiteral("2"));
-    QCOMPARE(warnings(), QStringLiteral("2"));
-    window_->IgnoreMessageNumber(w1);
-    QCOMPARE(errors(), QStringLiteral("2"));
-    QCOMPARE(warnings(), QStringLiteral("0"));
-    window_->IgnoreMessageNumber(e1);  // e2 is ignored twice over now
-    QCOMPARE(errors(), QStringLiteral("1"));
+    // Ignoring, by the Results list's menu and its keys.
+    choose(results, menu, e2, "Ignore this result");
+    QCOMPARE(counters(), (QStringList{"2", "2", "5 of 5 shown"}));
+    results->setCurrentIndex(ItemOf(results, w1));
+    QTest::keyClick(results, Qt::Key_Delete, Qt::ShiftModifier);
+    QCOMPARE(counters(), (QStringList{"2", "0", "3 of 3 shown"}));
+    choose(results, menu, e1, "Ignore all results with this message number");
+    QCOMPARE(counters(), (QStringList{"1", "0", "2 of 2 shown"}));  // e2 now ignored twice over
 
-    vtr::IgnoreLists::UnignoreMessageNumber(5);
-    window_->RefreshIgnoredResults();
-    QCOMPARE(warnings(), QStringLiteral("2"));
-    vtr::IgnoreLists::UnignoreMessageNumber(21);
-    window_->RefreshIgnoredResults();
-    QCOMPARE(errors(), QStringLiteral("2"));  // e1 back; e2 still ignored on its own
-    QCOMPARE(RowCount(Results()), 5);
-    Q_UNUSED(e3);
-    Q_UNUSED(w2);
+    // And back, from the Ignored Results list; the counters count the Results list whichever
+    // list is on view.
+    tabs->setCurrentIndex(frmVerifier::IgnoredResultsTab);
+    QCOMPARE(counters(), (QStringList{"1", "0", "4 of 4 shown"}));
+    const std::string storeFile = folder_->File("registry.reg");
+    const std::string cliStore = folder_->File("cli.reg");
+    fs::copy_file(storeFile, cliStore);
+    choose(ignored, ignoredMenu, w2, "Stop ignoring all results with this message number");
+    QCOMPARE(counters(), (QStringList{"1", "2", "2 of 2 shown"}));
+    // The store changed exactly as the command line's unignore changes it.
+    UnignoreOnTheCommandLine(cliStore, {QStringLiteral("--message"), QStringLiteral("5")});
+    QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
+
+    choose(ignored, ignoredMenu, e1, "Stop ignoring all results with this message number");
+    QCOMPARE(counters(), (QStringList{"2", "2", "1 of 1 shown"}));  // e2 still ignored alone
+    ignored->setFocus();
+    ignored->setCurrentIndex(ItemOf(ignored, e2));
+    QTest::keyClick(ignored, Qt::Key_Delete);
+    QCOMPARE(counters(), (QStringList{"3", "2", "0 of 0 shown"}));
+    tabs->setCurrentIndex(frmVerifier::ResultsTab);
+    QCOMPARE(counters(), (QStringList{"3", "2", "6 of 6 shown"}));
+    QVERIFY(dialogs_->boxes.isEmpty());
 }
 
 void FrmVerifierTest::relativeTargetsBecomeAbsolute() {
@@ -1133,6 +1172,16 @@ void FrmVerifierTest::relativeTargetsBecomeAbsolute() {
     QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(), absoluteShow);
     QVERIFY(
         LogLines().contains(kStamp + QStringLiteral("Show file does not exist: ") + absoluteShow));
+
+#ifndef Q_OS_WIN
+    // Typed from the home folder, as on a terminal.
+    fs::create_directories(folder_->File("home"));
+    const vtr::testsupport::ScopedEnvironment home("HOME", folder_->File("home"));
+    Find<QLineEdit>("txtTargetShow")->setText(QStringLiteral("~/Evening.lss"));
+    Click("cmdVerify");
+    QCOMPARE(Find<QLineEdit>("txtTargetShow")->text(),
+             QString::fromStdString(folder_->File("home") + "/Evening.lss"));
+#endif
 
     // Given on the command line (or dropped).
     QVERIFY(window_->SetTargetFile(QStringLiteral("Intro.las")));
@@ -1206,6 +1255,23 @@ void FrmVerifierTest::versionAndHelpNeedNoDisplay() {
     QCOMPARE(helpStatus, 0);
     QVERIFY(help.contains(QStringLiteral("--registry <FILE>")));
     QVERIFY(help.contains(QStringLiteral("[TARGET]")));
+
+#if defined(Q_OS_UNIX) && !defined(Q_OS_MACOS)
+    // Opening the window with no display at all: a message that says why, not an abort.
+    environment.remove(QStringLiteral("QT_QPA_PLATFORM"));
+    QProcess program;
+    program.setProcessEnvironment(environment);
+    program.start(
+        QStringLiteral(VTR_VERIFIER_PROGRAM),
+        {QStringLiteral("--registry"), QString::fromStdString(folder_->File("registry.reg"))});
+    QVERIFY(program.waitForFinished(30000));
+    QCOMPARE(program.exitStatus(), QProcess::NormalExit);
+    QCOMPARE(program.exitCode(), 3);
+    QCOMPARE(QString::fromLocal8Bit(program.readAllStandardError()),
+             QStringLiteral("vantori-verifier: there is no display to open the window on "
+                            "(neither DISPLAY nor WAYLAND_DISPLAY is set).\nOn a terminal, "
+                            "vantori-verify verifies the same installation without a window.\n"));
+#endif
 }
 
 void FrmVerifierTest::logColoursSuitThePalette() {
@@ -1303,12 +1369,7 @@ void FrmVerifierTest::stopIgnoringFromTheIgnoredList() {
              (QStringList{QStringLiteral("Five A"), QStringLiteral("Five B")}));
     QCOMPARE(ListTexts(ignored), (QStringList{QStringLiteral("Six C"), QStringLiteral("Seven D")}));
     QCOMPARE(Find<QLabel>("lblWarningsCount")->text(), QStringLiteral("2"));
-    QProcess cli;
-    cli.start(QStringLiteral(VTR_VERIFY_PROGRAM),
-              {QStringLiteral("--registry"), QString::fromStdString(cliStore),
-               QStringLiteral("unignore"), QStringLiteral("--key"), QStringLiteral("5-B / ")});
-    QVERIFY(cli.waitForFinished(30000));
-    QCOMPARE(cli.exitCode(), 0);
+    UnignoreOnTheCommandLine(cliStore, {QStringLiteral("--key"), QStringLiteral("5-B / ")});
     QCOMPARE(vtr::testsupport::ReadFileBytes(storeFile), vtr::testsupport::ReadFileBytes(cliStore));
     const std::string store = vtr::testsupport::ReadFileBytes(storeFile);
     QVERIFY(store.find("\"CountIgnoreMsg\"=dword:00000001") != std::string::npos);

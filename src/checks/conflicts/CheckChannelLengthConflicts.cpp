@@ -1,7 +1,6 @@
 #include "checks/conflicts/CheckChannelLengthConflicts.h"
 
 #include <memory>
-#include <unordered_map>
 #include <utility>
 
 #include "engine/CheckTypes.h"
@@ -9,6 +8,7 @@
 #include "engine/ProgressHandler.h"
 #include "engine/VtrError.h"
 #include "environment/SequenceUtils.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
@@ -32,14 +32,14 @@ void CheckChannelLengthConflicts::Check() {
     progress.SetProgressParts(static_cast<int32_t>(std::min<int64_t>(parts, INT32_MAX)));
 
     // The first track that lists each channel object.
-    std::unordered_map<const seqlib::Channel*, std::size_t> firstTrack;
+    seqlib::ChannelMap<std::size_t> firstTrack(static_cast<std::size_t>(parts));
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
             progress.MakeProgress(1);
-            const auto [entry, isNew] = firstTrack.try_emplace(channel.get(), t);
+            const auto [entry, isNew] = firstTrack.Insert(channel.get(), t);
             if (isNew)
                 continue;
-            const std::size_t first = entry->second;
+            const std::size_t first = *entry;
             if (tracks[first]->Length() == tracks[t]->Length())
                 continue;
             LibVerify::AddResult(

@@ -3,8 +3,6 @@
 #include <array>
 #include <deque>
 #include <memory>
-#include <unordered_map>
-#include <unordered_set>
 #include <vector>
 
 #include <utility>
@@ -16,6 +14,7 @@
 #include "engine/VtrError.h"
 #include "environment/LibFile.h"
 #include "environment/SequenceUtils.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/Sequence.h"
 #include "show/Show.h"
 
@@ -90,12 +89,15 @@ using Helper = BlobberConflictHelper<const BlobberRecord*, ChannelRecord>;
 struct SectionRecord {
     int32_t flag = 0;
     int32_t mask = 0;
-    // Every registration in the order made; per key, the first and the last of its chain.
+    // Every registration in the order made, chained per address.
     std::vector<Registration> registrations;
-    std::unordered_map<seqlib::Channel::SettingsId, std::pair<int32_t, int32_t>,
-                       seqlib::Channel::SettingsIdHash>
-        channels;
     std::vector<Helper::Blobber> blobbers;
+};
+
+// The registrations at one address in each section: the first and the last of the chain.
+struct AddressChains {
+    std::array<std::pair<int32_t, int32_t>, kFlagOrder.size()> chains;
+    AddressChains() { chains.fill({-1, -1}); }
 };
 
 class IntersequenceWalk {
@@ -145,7 +147,7 @@ class IntersequenceWalk {
         SectionRecord& section = sections_[SlotOf(sectionFlag)];
 
         const auto& tracks = walked.Tracks();
-        std::unordered_set<const seqlib::Channel*> inEarlierTracks;
+        seqlib::ChannelMap<bool> inEarlierTracks(walked.Channels().size());
         for (std::size_t t = 0; t < tracks.size(); ++t) {
             for (const auto& channel : tracks[t]->Channels()) {
                 ResumeStep([&] {
@@ -154,7 +156,7 @@ class IntersequenceWalk {
             }
             if (t + 1 < tracks.size()) {
                 for (const auto& channel : tracks[t]->Channels())
-                    inEarlierTracks.insert(channel.get());
+                    inEarlierTracks.Insert(channel.get(), true);
             }
         }
 
@@ -167,27 +169,30 @@ class IntersequenceWalk {
   private:
     void WalkChannel(SectionRecord& section, int32_t sequence, int32_t track,
                      const seqlib::Channel& channel,
-                     const std::unordered_set<const seqlib::Channel*>& inEarlierTracks) {
+                     const seqlib::ChannelMap<bool>& inEarlierTracks) {
         if (!channel.HasPhysicalSettings())
             return;
         // A channel shared by several tracks of one sequence counts once, with its first.
-        if (inEarlierTracks.count(&channel) != 0)
+        if (inEarlierTracks.Find(&channel) != nullptr)
             return;
-        const seqlib::Channel::SettingsId key = channel.SettingsIdentity();
+        // One look-up for every section: the chains of the channel's address.
+        const auto [at, isNew] =
+            addresses_.Insert(channel.SettingsIdentity(), static_cast<int32_t>(chains_.size()));
+        if (isNew)
+            chains_.emplace_back();
+        const int32_t chainsAt = *at;
         const ChannelRecord channelRecord{section.flag, sequence, track};
-        for (const int32_t flag : kFlagOrder) {
-            if ((section.mask & flag) == 0)
+        for (std::size_t slot = 0; slot < kFlagOrder.size(); ++slot) {
+            if ((section.mask & kFlagOrder[slot]) == 0)
                 continue;
-            SectionRecord& other = sections_[SlotOf(flag)];
-            const auto found = other.channels.find(key);
-            if (found != other.channels.end()) {
-                for (int32_t r = found->second.first; r >= 0; r = other.registrations[r].next) {
-                    const Registration registration = other.registrations[r];
-                    ResumeStep([&] {
-                        ReportChannelConflict(section.flag, sequence, track, channel, other.flag,
-                                              registration);
-                    });
-                }
+            SectionRecord& other = sections_[slot];
+            for (int32_t r = chains_[chainsAt].chains[slot].first; r >= 0;
+                 r = other.registrations[r].next) {
+                const Registration registration = other.registrations[r];
+                ResumeStep([&] {
+                    ReportChannelConflict(section.flag, sequence, track, channel, other.flag,
+                                          registration);
+                });
             }
             for (const auto& blobber : other.blobbers) {
                 bool found = false;
@@ -199,11 +204,13 @@ class IntersequenceWalk {
         // Registered after the comparison, so that a channel never meets itself.
         const auto index = static_cast<int32_t>(section.registrations.size());
         section.registrations.push_back({sequence, track, &channel, -1});
-        const auto [entry, isNew] = section.channels.try_emplace(key, index, index);
-        if (!isNew) {
-            section.registrations[entry->second.second].next = index;
-            entry->second.second = index;
+        auto& [first, last] = chains_[chainsAt].chains[SlotOf(section.flag)];
+        if (first < 0) {
+            first = index;
+        } else {
+            section.registrations[last].next = index;
         }
+        last = index;
     }
 
     void CompareIntensityFile(SectionRecord& section, int32_t sequence,
@@ -283,7 +290,10 @@ class IntersequenceWalk {
 
     const std::string& filename_;
     Helper helper_;
-    std::array<SectionRecord, 6> sections_;
+    std::array<SectionRecord, kFlagOrder.size()> sections_;
+    // The chains of each address met, found by the address.
+    seqlib::SettingsMap<int32_t> addresses_;
+    std::vector<AddressChains> chains_;
     std::vector<WalkedSequence> walked_;
     std::deque<BlobberRecord> blobberRecords_;  // addresses stay put as it grows
 };

@@ -1,8 +1,6 @@
 #include "checks/conflicts/CheckSeqChannelConflicts.h"
 
 #include <memory>
-#include <unordered_map>
-#include <unordered_set>
 #include <utility>
 #include <variant>
 #include <vector>
@@ -15,6 +13,7 @@
 #include "engine/ProgressHandler.h"
 #include "engine/VtrError.h"
 #include "environment/SequenceUtils.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
@@ -26,12 +25,13 @@ CheckSeqChannelConflicts::CheckSeqChannelConflicts(std::string filename)
 namespace {
 
 // Every channel object reached by walking the tracks in order, each once.
-std::vector<const seqlib::Channel*> DistinctChannels(const seqlib::Sequence& sequence) {
+std::vector<const seqlib::Channel*> DistinctChannels(const seqlib::Sequence& sequence,
+                                                     std::size_t entries) {
     std::vector<const seqlib::Channel*> channels;
-    std::unordered_set<const seqlib::Channel*> seen;
+    seqlib::ChannelMap<bool> seen(entries);
     for (const auto& track : sequence.Tracks()) {
         for (const auto& channel : track->Channels()) {
-            if (seen.insert(channel.get()).second)
+            if (seen.Insert(channel.get(), true).second)
                 channels.push_back(channel.get());
         }
     }
@@ -73,7 +73,10 @@ void CheckSeqChannelConflicts::Check() {
         };
 
     const auto& tracks = sequence->Tracks();
-    const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence);
+    std::size_t entries = 0;
+    for (const auto& track : tracks)
+        entries += track->Channels().size();
+    const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence, entries);
 
     // The files present, Gridcraft first, each with the kind and the track that carries it.
     std::vector<Helper::Blobber> blobbers;
@@ -90,28 +93,31 @@ void CheckSeqChannelConflicts::Check() {
 
     // One part per channel entry of the tracks, per channel compared with a file and per
     // device of a file compared with the files.
-    int64_t parts = 0;
-    for (const auto& track : tracks)
-        parts += static_cast<int64_t>(track->Channels().size());
+    auto parts = static_cast<int64_t>(entries);
     for (const auto& blobber : blobbers)
         parts += static_cast<int64_t>(distinct.size()) + blobber.file->DeviceCount();
     progress.SetProgressParts(static_cast<int32_t>(std::min<int64_t>(parts, INT32_MAX)));
 
-    // Channel against channel: the first channel seen under each settings key stands for it.
-    std::unordered_map<std::string, SeqChannelConflictsChInfo> firstSeen;
+    // Channel against channel: the first channel seen at each address stands for it.
+    std::vector<SeqChannelConflictsChInfo> firstSeen;
+    seqlib::SettingsMap<std::size_t> firstSeenAt(distinct.size());
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
             progress.MakeProgress(1);
             if (!channel->HasPhysicalSettings())
                 continue;
             ResumeStep([&] {
-                const auto [entry, isNew] = firstSeen.try_emplace(channel->SettingsKey());
-                SeqChannelConflictsChInfo& earlier = entry->second;
+                const auto [at, isNew] =
+                    firstSeenAt.Insert(channel->SettingsIdentity(), firstSeen.size());
                 if (isNew) {
-                    earlier.SetChannel(channel);
-                    earlier.SetTrack(tracks[t]);
-                    earlier.SetTrackIndex(static_cast<int32_t>(t));
-                } else if (earlier.Channel() != channel) {
+                    SeqChannelConflictsChInfo& first = firstSeen.emplace_back();
+                    first.SetChannel(channel);
+                    first.SetTrack(tracks[t]);
+                    first.SetTrackIndex(static_cast<int32_t>(t));
+                    return;
+                }
+                const SeqChannelConflictsChInfo& earlier = firstSeen[*at];
+                if (earlier.Channel() != channel) {
                     // Tracks share channel objects; only a different channel conflicts.
                     LibVerify::AddResult(
                         Messages::SequenceChannelSettingsConflict,

@@ -1,7 +1,6 @@
 #include "checks/network/CheckUsedNetworksDefined.h"
 
 #include <memory>
-#include <unordered_set>
 #include <utility>
 
 #include "checks/common/BlobberConflictHelper.h"
@@ -11,6 +10,7 @@
 #include "environment/NetworkPreferences.h"
 #include "environment/SequenceUtils.h"
 #include "sequencelib/DeviceTypeInfo.h"
+#include "sequencelib/FlatMap.h"
 #include "sequencelib/Sequence.h"
 
 namespace vtr {
@@ -49,10 +49,10 @@ void CheckUsedNetworksDefined::Check() {
     const NetworkPreferences& preferences = LibVerify::GetNetworkPreferences();
 
     const auto& tracks = sequence->Tracks();
-    std::unordered_set<const seqlib::Channel*> examined;
+    seqlib::ChannelMap<bool> examined(sequence->Channels().size());
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
-            if (!examined.insert(channel.get()).second)
+            if (!examined.Insert(channel.get(), true).second)
                 continue;  // already seen through another track that shares it
             if (IsNetworkDefined(preferences, channel->DeviceType(), channel->Network()))
                 continue;

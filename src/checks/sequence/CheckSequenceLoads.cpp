@@ -28,7 +28,9 @@ void CheckSequenceLoads::Check() {
     const auto sequence = ResumeOr(std::shared_ptr<seqlib::Sequence>(),
                                    [&] { return LibVerify::LoadSequence(filename_); });
     if (!sequence) {
-        LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_});
+        // A cancellation that stopped the load says nothing of the file.
+        if (!LibVerify::IsCancelled())
+            LibVerify::AddResult(Messages::SequenceCannotLoad, {filename_});
         return;
     }
 

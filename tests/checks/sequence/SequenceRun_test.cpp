@@ -11,6 +11,7 @@
 #include "schedule/Schedule.h"
 #include "schedule/WeekTime.h"
 #include "schedule/YearSchedule.h"
+#include "vtrsupport/SequenceGenerator.h"
 #include "show/Show.h"
 #include "show/TriggeredSequences.h"
 
@@ -19,6 +20,7 @@ namespace {
 
 using ::testing::Contains;
 using ::testing::ElementsAre;
+using ::testing::Not;
 using ::testing::UnorderedElementsAreArray;
 using testsupport::DeviceXml;
 using testsupport::IntensityFileXml;
@@ -188,6 +190,37 @@ TEST_F(SequenceRunTest, ASequenceSharedByTwoShowsIsCheckedForEachReferenceAndLoa
     // The shows are apart in time, so the sequence conflicts with nothing.
     EXPECT_THAT(client.Lines("Checking Intersequence channel conflicts: "),
                 ElementsAre(firstFile, secondFile));
+}
+
+TEST_F(SequenceRunTest, ACancelWhileASequenceLoadsStopsTheLoadAndBlamesNothingOnTheFile) {
+    seqlib::SequenceGenerator::Options options;
+    options.channels = 400;
+    options.eventsPerChannel = 200;
+    const std::string big = DataFile("Big.las");
+    seqlib::SequenceGenerator::WriteFile(big, options);
+    Show show;
+    show.Musical()->List() = {big};
+    const std::string showFile = DataFile("Show.lss");
+    WriteFileBytes(showFile, ShowFunctions::ShowToText(show));
+
+    // The user cancels at the first turn the user interface gets once the load has begun.
+    bool loading = false;
+    client.onLine = [&](const std::string& line) {
+        loading = loading || line == "Transient Loading 0% of " + big;
+    };
+    LibVerify::SetEventPump([&] {
+        if (loading && !LibVerify::IsCancelled())
+            LibVerify::CancelVerification();
+    });
+    VerifySchedule(showFile);
+    LibVerify::SetEventPump(nullptr);
+
+    EXPECT_THAT(client.Lines("Transient Loading "), ElementsAre("0% of " + big));
+    EXPECT_THAT(client.Lines("Transient Cannot load"), ElementsAre());
+    EXPECT_THAT(client.Lines("Result "), Contains("2"));
+    EXPECT_THAT(client.Lines("Result "), Not(Contains("24"))) << "the file is not at fault";
+    EXPECT_THAT(client.Lines("ChecksCompleted "), ElementsAre("true"));
+    EXPECT_EQ(LibVerify::GetFileLoadCounts().sequenceLoads, 1);
 }
 
 }  // namespace
