@@ -558,11 +558,18 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
     if (state.prefetch)
         loaded = state.prefetch->Take(fileName);
     if (loaded) {
-        // Loaded by a worker: its progress is told now, as if loaded here.
-        for (const int32_t percent : loaded->progress)
+        // Loaded by a worker: its progress is told now, as if loaded here, and a cancel seen
+        // at one of its percents stops it there, as it would have stopped a load made here.
+        bool stopped = false;
+        for (const int32_t percent : loaded->progress) {
             SequenceLoader::TellProgress(fileName, percent);
-        sequence = std::move(loaded->sequence);
-        if (loaded->failure) {
+            if (state.cancelled && state.verifying) {
+                stopped = true;
+                break;
+            }
+        }
+        sequence = stopped ? nullptr : std::move(loaded->sequence);
+        if (loaded->failure && !stopped) {
             failed = true;
             failure = DescribeException(loaded->failure);
         }

@@ -21,10 +21,10 @@
 #include "engine/SequencePrefetch.h"
 #include "environment/VTRCommon.h"
 #include "schedule/DateTime.h"
-#include "support/PeImage.h"
+#include "vtrsupport/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
-#include "vtrgen/InstallationGenerator.h"
+#include "vtrsupport/InstallationGenerator.h"
 
 namespace vtr {
 namespace {
@@ -103,8 +103,9 @@ class ParallelLoading : public testsupport::StoreTest {
     // Runs with one job and with several, and compares everything told.
     void ExpectSameWhateverTheJobs(int cancelAt = 0) {
         const Told serial = Run(1, cancelAt);
-        if (cancelAt == 0)
+        if (cancelAt == 0) {
             ASSERT_GT(serial.sequenceLoads, 0);
+        }
         for (const int jobs : {2, 4}) {
             SCOPED_TRACE("jobs " + std::to_string(jobs));
             const Told parallel = Run(jobs, cancelAt);

@@ -8,7 +8,7 @@
 
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
-#include "sequencelib/SequenceGenerator.h"
+#include "vtrsupport/SequenceGenerator.h"
 #include "support/TempStore.h"
 
 namespace vtr {
