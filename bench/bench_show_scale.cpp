@@ -20,9 +20,9 @@
 #include "engine/LibVerify.h"
 #include "environment/RegistryStore.h"
 #include "environment/VTRCommon.h"
-#include "vtrsupport/PeImage.h"
 #include "support/SequenceBenchSupport.h"
 #include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 namespace {
 

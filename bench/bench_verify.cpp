@@ -178,10 +178,9 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 void BM_VerifyEntireSchedule(benchmark::State& state) {
     for (auto _ : state) {
-        const auto run =
-            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                 fixture->installation.registryFile, "--format", "json",
-                                 "--jobs", "1"});
+        const auto run = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                              fixture->installation.registryFile, "--format",
+                                              "json", "--jobs", "1"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -204,9 +203,9 @@ BENCHMARK(BM_VerifyEntireSchedule)->UseManualTime()->Iterations(3)->Unit(benchma
 // The same verification with the sequence files loaded on every processor (the default).
 void BM_VerifyEntireScheduleEveryProcessor(benchmark::State& state) {
     for (auto _ : state) {
-        const auto run = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                              fixture->installation.registryFile, "--format",
-                                              "json"});
+        const auto run =
+            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                 fixture->installation.registryFile, "--format", "json"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;

@@ -21,10 +21,10 @@
 #include "engine/SequencePrefetch.h"
 #include "environment/VTRCommon.h"
 #include "schedule/DateTime.h"
-#include "vtrsupport/PeImage.h"
 #include "support/TempStore.h"
 #include "support/VerifierFixture.h"
 #include "vtrsupport/InstallationGenerator.h"
+#include "vtrsupport/PeImage.h"
 
 namespace vtr {
 namespace {

@@ -8,8 +8,8 @@
 
 #include "engine/VtrError.h"
 #include "sequencelib/Sequence.h"
-#include "vtrsupport/SequenceGenerator.h"
 #include "support/TempStore.h"
+#include "vtrsupport/SequenceGenerator.h"
 
 namespace vtr {
 namespace {
