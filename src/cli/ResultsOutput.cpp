@@ -248,19 +248,22 @@ nlohmann::ordered_json CountsJson(const SeverityCounts& counts, int64_t ignored)
 }
 
 // Writes a JSON document a piece at a time, laid out exactly as nlohmann's dump with an indent
-// of two: objects and arrays are opened and closed here, each value in them is dumped on its
-// own, so a long list never becomes a second document in memory. Bytes that are not UTF-8
-// are written as U+FFFD.
+// of two: objects and arrays are opened and closed here, and each value in them is written on
+// its own at the depth it stands at, so a long list never becomes a second document in memory.
+// Bytes that are not UTF-8 are written as U+FFFD.
 class JsonWriter {
   public:
-    explicit JsonWriter(std::ostream& out) : out_(out) {}
+    explicit JsonWriter(std::ostream& out)
+        : out_(out),
+          serializer_(nlohmann::detail::output_adapter<char>(text_), ' ',
+                      nlohmann::ordered_json::error_handler_t::replace) {}
 
     void BeginObject() { Begin('{'); }
     void EndObject() { End('}'); }
     void BeginArray() { Begin('['); }
     void EndArray() { End(']'); }
 
-    // The key of the next member of the open object.
+    // The key of the next member of the open object; its value follows.
     void Key(const char* key) {
         Next();
         out_ << '"' << key << "\": ";
@@ -270,17 +273,51 @@ class JsonWriter {
         Key(key);
         Value(value);
     }
-    // The next element of the open array.
-    void Element(const nlohmann::ordered_json& value) {
-        Next();
-        Value(value);
+
+    // A value: the next element of the open array, or the value of the key just written.
+    void Value(const nlohmann::ordered_json& value) {
+        Place();
+        text_.clear();
+        serializer_.dump(value, true, false, kIndent,
+                         kIndent * static_cast<unsigned>(open_.size()));
+        out_.write(text_.data(), static_cast<std::streamsize>(text_.size()));
+    }
+    void Text(std::string_view text) {
+        if (!Plain(text)) {
+            Value(std::string(text));
+            return;
+        }
+        Place();
+        out_ << '"';
+        out_.write(text.data(), static_cast<std::streamsize>(text.size()));
+        out_ << '"';
+    }
+    void Number(int64_t number) {
+        Place();
+        out_ << number;
+    }
+    void Bool(bool value) {
+        Place();
+        out_ << (value ? "true" : "false");
     }
 
   private:
-    void Begin(char bracket) {
+    static constexpr unsigned kIndent = 2;
+
+    // Printable ASCII without a quote or a backslash: the text is its own JSON string, which
+    // the serializer would write unchanged.
+    static bool Plain(std::string_view text) {
+        return std::all_of(text.begin(), text.end(),
+                           [](char c) { return c >= 0x20 && c < 0x7F && c != '"' && c != '\\'; });
+    }
+    // Starts a value on a line of its own, unless it follows its key.
+    void Place() {
         if (!keyed_ && !open_.empty())
             Next();
         keyed_ = false;
+    }
+    void Begin(char bracket) {
+        Place();
         out_ << bracket;
         open_.push_back(true);
     }
@@ -288,34 +325,20 @@ class JsonWriter {
         const bool empty = open_.back();
         open_.pop_back();
         if (!empty)
-            out_ << '\n' << std::string(2 * open_.size(), ' ');
+            out_ << '\n' << std::string(kIndent * open_.size(), ' ');
         out_ << bracket;
     }
     // Starts the next member or element of the open object or array on a line of its own.
     void Next() {
-        out_ << (open_.back() ? "\n" : ",\n") << std::string(2 * open_.size(), ' ');
+        out_ << (open_.back() ? "\n" : ",\n") << std::string(kIndent * open_.size(), ' ');
         open_.back() = false;
-    }
-    // A whole value, its lines after the first shifted to the depth it stands at (the line
-    // breaks of a dump are all layout: those inside strings are escaped).
-    void Value(const nlohmann::ordered_json& value) {
-        keyed_ = false;
-        text_ = value.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace);
-        const std::string indent(2 * open_.size(), ' ');
-        std::size_t start = 0;
-        for (std::size_t end = text_.find('\n'); end != std::string::npos;
-             end = text_.find('\n', start)) {
-            out_.write(text_.data() + start, static_cast<std::streamsize>(end + 1 - start));
-            out_ << indent;
-            start = end + 1;
-        }
-        out_.write(text_.data() + start, static_cast<std::streamsize>(text_.size() - start));
     }
 
     std::ostream& out_;
+    std::string text_;  // the value last serialized, its buffer used again
+    nlohmann::detail::serializer<nlohmann::ordered_json> serializer_;
     std::vector<bool> open_;  // per open object or array: nothing in it yet
     bool keyed_ = false;      // a key was written and waits for its value
-    std::string text_;        // the last value dumped, its buffer used again
 };
 
 }  // namespace
@@ -403,18 +426,29 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
     // The results one at a time, each its own small document.
     json.Key("results");
     json.BeginArray();
-    nlohmann::ordered_json item;
     for (const std::size_t i : listed.shown) {
         const Result& result = *grouping.At(i);
-        item["severity"] = static_cast<int32_t>(result.Severity());
-        item["severityText"] = result.SeverityText();
-        item["messageNumber"] = result.MessageNumber();
-        item["helpContextId"] = result.HelpContextID();
-        item["summary"] = result.Summary();
-        item["details"] = result.Details();
-        item["ignored"] = grouping.Ignored(i);
-        item["ignoreKey"] = IgnoreKeyText::Encode(result.IgnoreKey());
-        json.Element(item);
+        json.BeginObject();
+        json.Key("severity");
+        json.Number(static_cast<int32_t>(result.Severity()));
+        json.Key("severityText");
+        json.Text(result.SeverityText());
+        json.Key("messageNumber");
+        json.Number(result.MessageNumber());
+        json.Key("helpContextId");
+        json.Number(result.HelpContextID());
+        json.Key("summary");
+        json.Text(result.Summary());
+        json.Key("details");
+        json.BeginArray();
+        for (const std::string& detail : result.Details())
+            json.Text(detail);
+        json.EndArray();
+        json.Key("ignored");
+        json.Bool(grouping.Ignored(i));
+        json.Key("ignoreKey");
+        json.Text(IgnoreKeyText::Encode(result.IgnoreKey()));
+        json.EndObject();
     }
     json.EndArray();
 
@@ -441,7 +475,7 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
             entry["title"] = group.title;
             entry["counts"] = CountsJson(groupCounts, ignored);
             entry["results"] = std::move(members);
-            json.Element(entry);
+            json.Value(entry);
         }
         json.EndArray();
     }

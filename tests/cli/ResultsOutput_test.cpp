@@ -408,7 +408,8 @@ TEST(ResultsOutputTest, JsonIsLaidOutExactlyAsTheWholeDocumentDumped) {
 
     RunRecord record = SampleRecord();
     record.results.push_back({MakeResult(Severity::Error, 21, 21, "Show file does not exist",
-                                         {std::string("C:\\Shows\\No\xebl.lss"), "two\nlines"}),
+                                         {std::string("C:\\Shows\\No\xebl.lss"), "two\nlines",
+                                          "a \"quoted\"\tname\x7f", "caf\xc3\xa9", ""}),
                               false});
     record.results.push_back({Conflict("A.lss", "a.las", "b.las", "Star"), false, true});
     std::vector<Presentation> presentations(4);
