@@ -54,6 +54,15 @@ export TMPDIR=$prefix/.runtime
 mkdir -p "$TMPDIR"
 unset WAYLAND_DISPLAY
 [ "$keep_display" -eq 1 ] || unset DISPLAY
+# Wine keeps the host's QT_ variables from Windows programs (they are meant for a Qt of the
+# host) and hands one on under its own name only when it comes with WINE before it. The
+# window and its tests are Qt programs of Windows: QT_QPA_PLATFORM, QT_QPA_FONTDIR and the
+# others set for them reach them.
+for name in $(compgen -e); do
+    case $name in
+        QT_*) export "WINE$name=${!name}" ;;
+    esac
+done
 if [ ${#search_path[@]} -gt 0 ]; then
     WINEPATH=$(IFS=';'; echo "${search_path[*]}")${WINEPATH:+;$WINEPATH}
     export WINEPATH

@@ -9,9 +9,21 @@
 #include <QCommandLineParser>
 #include <QMessageBox>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <exception>
 #include <optional>
+
+#ifdef _WIN32
+#ifndef NOMINMAX
+#define NOMINMAX
+#endif
+#ifndef WIN32_LEAN_AND_MEAN
+#define WIN32_LEAN_AND_MEAN
+#endif
+#include <io.h>
+#include <windows.h>
+#endif
 
 #include "UiText.h"
 #include "VtrVersion.h"
@@ -48,18 +60,68 @@ void SetApplicationNames() {
     QCoreApplication::setApplicationVersion(QString::fromLatin1(vtr::kVersionText));
 }
 
+#ifdef _WIN32
+// Whether a standard stream already goes somewhere that shows or keeps what is written: a
+// file or a pipe it was redirected to, or a console the program has (under Wine, started
+// from a terminal).
+bool GoesSomewhere(FILE* stream) {
+    const int descriptor = _fileno(stream);
+    if (descriptor < 0)
+        return false;
+    const auto handle = reinterpret_cast<HANDLE>(_get_osfhandle(descriptor));
+    if (handle == nullptr || handle == INVALID_HANDLE_VALUE)
+        return false;
+    const DWORD type = GetFileType(handle);
+    return type == FILE_TYPE_DISK || type == FILE_TYPE_PIPE || type == FILE_TYPE_CHAR;
+}
+#endif
+
+// Whether the answers to --help and --version can be printed where the user sees them. The
+// window is a Windows GUI program, which has no console of its own: its answers go to the
+// file or pipe its output was redirected to, else to the console of the command prompt it
+// was started from (the standard streams that go nowhere are reopened on it).
+// Started from neither (from the Start menu, say), they cannot.
+bool CanPrintAnswers() {
+#ifdef _WIN32
+    const bool output = GoesSomewhere(stdout);
+    const bool errors = GoesSomewhere(stderr);
+    bool printable = output;
+    if (!(output && errors) && AttachConsole(ATTACH_PARENT_PROCESS)) {
+        if (!output)
+            printable = std::freopen("CONOUT$", "w", stdout) != nullptr;
+        if (!errors)
+            static_cast<void>(std::freopen("CONOUT$", "w", stderr));
+    }
+    return printable;
+#else
+    return true;
+#endif
+}
+
 // --help and --version are answered without a window system, so that they work where there
 // is no display (a terminal on a server, a build machine): the first reading happens before
-// the window's application exists, and ends the program when either is asked for.
+// the window's application exists, and ends the program when either is asked for. Where
+// nothing can be printed, Qt shows the answer in a message box.
 void AnswerHelpAndVersion(int argc, char** argv) {
     QCoreApplication application(argc, argv);
     CommandLine commandLine;
     // Errors (and the window system's own options) are left to the second reading.
     commandLine.parser.parse(QCoreApplication::arguments());
-    if (commandLine.parser.isSet(commandLine.help))
-        commandLine.parser.showHelp(0);
-    if (commandLine.parser.isSet(commandLine.version))
+    const bool help = commandLine.parser.isSet(commandLine.help);
+    const bool version = commandLine.parser.isSet(commandLine.version);
+    if (!help && !version)
+        return;
+    if (!CanPrintAnswers()) {
+        if (help)
+            commandLine.parser.showHelp(0);
         commandLine.parser.showVersion();
+    }
+    const QString answer = help ? commandLine.parser.helpText()
+                                : QCoreApplication::applicationName() + QLatin1Char(' ') +
+                                      QCoreApplication::applicationVersion() + QLatin1Char('\n');
+    std::fputs(answer.toLocal8Bit().constData(), stdout);
+    std::fflush(stdout);
+    std::exit(0);
 }
 
 // Where the window would open on X11 or Wayland, with neither a display named nor another
