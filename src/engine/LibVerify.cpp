@@ -161,10 +161,10 @@ void Broadcast(Operation&& operation) {
 
 constexpr std::size_t kMaxDetails = 9;
 
-// How many files the workers load beyond those the checks have taken, per worker: enough
-// to keep them busy while the checks of one file run, few enough to bound the memory of
-// sequences loaded and not yet asked for.
-constexpr std::size_t kFilesAheadPerWorker = 2;
+// How many files the workers load beyond those the checks have taken, per worker: one keeps
+// them busy, since a file's checks take a fraction of its load, and bounds the memory of
+// sequences loaded and not yet asked for to one per worker.
+constexpr std::size_t kFilesAheadPerWorker = 1;
 
 // The sequence files a check just queued will load, in the order it loads them, as far as is
 // known when it is queued. A wrong guess costs time, never a result: the first check to ask
