@@ -5,7 +5,8 @@
 //
 // The installations are the installation tool's (vantori-make-installation FOLDER and the
 // options below), verified by the command-line verifier as a child process
-// (vantori-verify --schedule --registry FILE --format json). Judged by (printed at the end):
+// (vantori-verify --schedule --registry FILE --format json --jobs 1). Judged by (printed at the
+// end):
 //
 //   --channels 20000 --events 2        many channels of few events    at most 1.00
 //   --channels 8000 --events 4                                        at most 1.00
@@ -226,8 +227,9 @@ void BM_VerifyEntireSchedule(benchmark::State& state) {
     Installation& installation = installations[state.range(0)];
     installation.verifySeconds = 1e9;
     for (auto _ : state) {
-        const auto run = bench::MeasureChild(
-            {Verifier(), "--schedule", "--registry", installation.registry, "--format", "json"});
+        const auto run =
+            bench::MeasureChild({Verifier(), "--schedule", "--registry", installation.registry,
+                                 "--format", "json", "--jobs", "1"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;

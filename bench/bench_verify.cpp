@@ -5,10 +5,17 @@
 //   verification / bare parse   the command-line verifier (vantori-verify --schedule
 //                               --registry FILE --format json, a child process) over a bare
 //                               pugixml parse of every sequence file's bytes, measured in the
-//                               same run: at most 1.50. Both are single-threaded; the ratio
+//                               same run, the verifier loading on one processor (--jobs 1):
+//                               at most 1.50. Both are single-threaded; the ratio
 //                               of their processor times is judged, since on a shared machine
 //                               the wall-clock ratio mostly measures the other processes (it
 //                               is printed too).
+//   every processor / bare parse the same verification loading on every processor (the
+//                               default --jobs) over the serial bare parse, in wall-clock
+//                               time: at most 0.60
+//   peak memory, every processor the verifier's peak with the default jobs over (jobs + 1)
+//                               times the largest sequence file plus 300 bytes per loaded
+//                               channel: below 1.00
 //   intersequence doubling      CheckIntersequenceConflicts of a show with 2N sequences over
 //                               the same show with N: at most 2.00 (work grows with channels
 //                               times overlapping sections, never with the square)
@@ -32,6 +39,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "checks/conflicts/CheckIntersequenceConflicts.h"
@@ -88,6 +96,8 @@ struct Fixture {
     double loadProcessor = 0;
     std::optional<ChildRun> child;  // the fastest run
     std::uint64_t childPeakBytes = 0;
+    std::optional<ChildRun> parallel;  // the fastest run loading on every processor
+    std::uint64_t parallelPeakBytes = 0;
     std::uint64_t baselinePeakBytes = 0;  // the verifier doing nothing (--version)
     double bytesPerChannel = 0;           // the peak's growth per loaded channel
 };
@@ -168,9 +178,9 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 void BM_VerifyEntireSchedule(benchmark::State& state) {
     for (auto _ : state) {
-        const auto run =
-            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                 fixture->installation.registryFile, "--format", "json"});
+        const auto run = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                              fixture->installation.registryFile, "--format",
+                                              "json", "--jobs", "1"});
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
@@ -189,6 +199,31 @@ void BM_VerifyEntireSchedule(benchmark::State& state) {
     }
 }
 BENCHMARK(BM_VerifyEntireSchedule)->UseManualTime()->Iterations(3)->Unit(benchmark::kMillisecond);
+
+// The same verification with the sequence files loaded on every processor (the default).
+void BM_VerifyEntireScheduleEveryProcessor(benchmark::State& state) {
+    for (auto _ : state) {
+        const auto run =
+            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
+                                 fixture->installation.registryFile, "--format", "json"});
+        if (!run) {
+            state.SkipWithError("the verifier could not be run");
+            break;
+        }
+        state.SetIterationTime(run->wallSeconds);
+        if (!fixture->parallel || run->wallSeconds < fixture->parallel->wallSeconds)
+            fixture->parallel = run;
+        fixture->parallelPeakBytes = std::max(fixture->parallelPeakBytes, run->peakBytes);
+    }
+    if (fixture->parallel) {
+        state.counters["cpu_ms"] = fixture->parallel->processorSeconds * 1e3;
+        state.counters["peak_MB"] = static_cast<double>(fixture->parallelPeakBytes) / 1e6;
+    }
+}
+BENCHMARK(BM_VerifyEntireScheduleEveryProcessor)
+    ->UseManualTime()
+    ->Iterations(3)
+    ->Unit(benchmark::kMillisecond);
 
 // Two installations of 2,000-channel sequences that differ only in their number of shows:
 // the growth of the peak per loaded channel between them.
@@ -385,6 +420,23 @@ int main(int argc, char** argv) {
                     ratio < 1.0 ? "ok" : "ABOVE TARGET");
         std::printf("%-62s %.1f MB\n", "  the verifier's own peak doing nothing (--version):",
                     static_cast<double>(f.baselinePeakBytes) / 1e6);
+    }
+    if (f.parallel && f.parseWall > 0) {
+        const int jobs = std::max(1, static_cast<int>(std::thread::hardware_concurrency()));
+        PrintRatio("Every processor: verification / serial bare parse (wall):",
+                   f.parallel->wallSeconds / f.parseWall, 0.6,
+                   Milliseconds(f.parallel->wallSeconds, f.parseWall) + ", " +
+                       std::to_string(jobs) + " jobs");
+        const auto& i = f.installation;
+        const double budget = (jobs + 1.0) * static_cast<double>(i.largestSequenceFileBytes) +
+                              kBytesPerChannel * static_cast<double>(i.channels);
+        const double ratio = static_cast<double>(f.parallelPeakBytes) / budget;
+        char detail[96];
+        std::snprintf(detail, sizeof detail, "%.1f MB / %.1f MB",
+                      static_cast<double>(f.parallelPeakBytes) / 1e6, budget / 1e6);
+        std::printf("%-62s %.2f (%s; target < 1.00) %s\n",
+                    "  peak / ((jobs + 1) x largest file + 300 B per channel):", ratio, detail,
+                    ratio < 1.0 ? "ok" : "ABOVE TARGET");
     }
     if (f.bytesPerChannel > 0) {
         std::printf("%-62s %.0f bytes (target <= 300) %s\n",

@@ -18,6 +18,7 @@
 #include "engine/LibVerify.h"
 #include "engine/OutputLog.h"
 #include "engine/ResultsReport.h"
+#include "engine/SequencePrefetch.h"
 #include "engine/VtrError.h"
 #include "environment/OutputFile.h"
 #include "environment/RegistryStore.h"
@@ -238,6 +239,7 @@ int RunVerify(const Options& givenOptions, Console& console) {
         return ExitStatus::CannotSetUp;
     }
 
+    LibVerify::SetLoadingJobs(options.jobs);
     LibVerify::RunVerification();
     if (progress)
         progress->Erase();

@@ -25,6 +25,8 @@ constexpr const char* kProgram = "vantori-verify";
 // Help is written for 80 columns, option names on the left, descriptions from this column.
 constexpr std::size_t kHelpWidth = 80;
 constexpr std::size_t kNameColumn = 26;
+// The most processors --jobs takes.
+constexpr int kMaxJobs = 256;
 
 const char* const kDescription =
     "Checks a Vantori show-lighting installation before the show runs: settings, schedules, "
@@ -414,11 +416,13 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
     std::string color = "auto";
     std::string baseline;
     std::string writeBaseline;
+    std::string jobs;
 
     const std::string target = "What to verify";
     const std::string triage = "Finding what matters";
     const std::string output_ = "Output";
     const std::string nightly = "Nightly checks";
+    const std::string speed = "Speed";
     const std::string store = "Settings";
 
     CLI::Option* scheduleOption =
@@ -493,6 +497,14 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
                        "--baseline file)")
             ->type_name("FILE")
             ->group(nightly);
+
+    CLI::Option* jobsOption =
+        app.add_option("--jobs", jobs,
+                       "load sequence files on N processors at once (the default: every "
+                       "processor of the machine; 1 loads them one after another). The results "
+                       "are the same whatever N.")
+            ->type_name("N")
+            ->group(speed);
 
     CLI::Option* registryOption =
         app.add_option("--registry", registry,
@@ -578,7 +590,7 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
         for (CLI::Option* option :
              {scheduleOption, showOption, sequenceOption, outputOption, logOption, quietOption,
               severityOption, groupByOption, statisticsOption, failOnOption, colorOption,
-              baselineOption, writeBaselineOption}) {
+              baselineOption, writeBaselineOption, jobsOption}) {
             if (option->count() > 0)
                 verifyOnly.push_back("--" + option->get_lnames().front());
         }
@@ -666,6 +678,22 @@ ParseOutcome ParseCommandLine(int argc, const char* const* argv, std::ostream& o
             return ParseOutcome{std::nullopt, ExitStatus::Usage};
         }
         *kept = *value;
+    }
+
+    if (jobsOption->count() > 0) {
+        std::size_t used = 0;
+        int value = 0;
+        try {
+            value = std::stoi(jobs, &used);
+        } catch (const std::exception&) {
+            used = 0;
+        }
+        if (used == 0 || used != jobs.size() || value < 1 || value > kMaxJobs) {
+            Usage(err, "--jobs needs a number of processors from 1 to " + std::to_string(kMaxJobs) +
+                           ", not " + Quoted(jobs));
+            return ParseOutcome{std::nullopt, ExitStatus::Usage};
+        }
+        options.jobs = value;
     }
 
     std::optional<std::string> reason = Choose<Severity>(

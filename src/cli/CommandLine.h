@@ -57,6 +57,7 @@ struct Options {
     ColorChoice color = ColorChoice::Auto;
     std::optional<std::string> baseline;       // list only results whose keys are not in it
     std::optional<std::string> writeBaseline;  // save this run's keys
+    int jobs = 0;  // processors that load sequence files; 0: every one of the machine's
 
     // Ignore and Unignore: exactly one of the two.
     std::optional<int32_t> messageNumber;

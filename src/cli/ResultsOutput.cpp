@@ -5,8 +5,6 @@
 #include <algorithm>
 #include <cctype>
 #include <ostream>
-#include <sstream>
-#include <unordered_map>
 
 #include "VtrVersion.h"
 #include "engine/IgnoreKeyText.h"
@@ -128,13 +126,14 @@ void WriteResult(std::ostream& out, const Prepared& prepared, const Result& resu
 }
 
 // One listing (the results, or the ignored ones), errors first, under headings when grouped.
-void WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) {
+// False when it listed nothing.
+bool WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) {
     const ResultView view =
         prepared.View(listing, ResultOrder::ErrorsFirst, prepared.Settings().groupBy);
     if (view.groups.empty()) {
         for (const std::size_t i : view.shown)
             WriteResult(out, prepared, *prepared.Grouping().At(i));
-        return;
+        return !view.shown.empty();
     }
     bool first = true;
     for (const ResultGroup& group : view.groups) {
@@ -147,6 +146,7 @@ void WriteListing(std::ostream& out, const Prepared& prepared, Listing listing) 
         for (const std::size_t i : group.members)
             WriteResult(out, prepared, *prepared.Grouping().At(i));
     }
+    return true;
 }
 
 // Counts instead of results: per message number and, when grouped, per group.
@@ -247,6 +247,100 @@ nlohmann::ordered_json CountsJson(const SeverityCounts& counts, int64_t ignored)
     return json;
 }
 
+// Writes a JSON document a piece at a time, laid out exactly as nlohmann's dump with an indent
+// of two: objects and arrays are opened and closed here, and each value in them is written on
+// its own at the depth it stands at, so a long list never becomes a second document in memory.
+// Bytes that are not UTF-8 are written as U+FFFD.
+class JsonWriter {
+  public:
+    explicit JsonWriter(std::ostream& out)
+        : out_(out),
+          serializer_(nlohmann::detail::output_adapter<char>(text_), ' ',
+                      nlohmann::ordered_json::error_handler_t::replace) {}
+
+    void BeginObject() { Begin('{'); }
+    void EndObject() { End('}'); }
+    void BeginArray() { Begin('['); }
+    void EndArray() { End(']'); }
+
+    // The key of the next member of the open object; its value follows.
+    void Key(const char* key) {
+        Next();
+        out_ << '"' << key << "\": ";
+        keyed_ = true;
+    }
+    void Member(const char* key, const nlohmann::ordered_json& value) {
+        Key(key);
+        Value(value);
+    }
+
+    // A value: the next element of the open array, or the value of the key just written.
+    void Value(const nlohmann::ordered_json& value) {
+        Place();
+        text_.clear();
+        serializer_.dump(value, true, false, kIndent,
+                         kIndent * static_cast<unsigned>(open_.size()));
+        out_.write(text_.data(), static_cast<std::streamsize>(text_.size()));
+    }
+    void Text(std::string_view text) {
+        if (!Plain(text)) {
+            Value(std::string(text));
+            return;
+        }
+        Place();
+        out_ << '"';
+        out_.write(text.data(), static_cast<std::streamsize>(text.size()));
+        out_ << '"';
+    }
+    void Number(int64_t number) {
+        Place();
+        out_ << number;
+    }
+    void Bool(bool value) {
+        Place();
+        out_ << (value ? "true" : "false");
+    }
+
+  private:
+    static constexpr unsigned kIndent = 2;
+
+    // Printable ASCII without a quote or a backslash: the text is its own JSON string, which
+    // the serializer would write unchanged.
+    static bool Plain(std::string_view text) {
+        return std::all_of(text.begin(), text.end(),
+                           [](char c) { return c >= 0x20 && c < 0x7F && c != '"' && c != '\\'; });
+    }
+    // Starts a value on a line of its own, unless it follows its key.
+    void Place() {
+        if (!keyed_ && !open_.empty())
+            Next();
+        keyed_ = false;
+    }
+    void Begin(char bracket) {
+        Place();
+        out_ << bracket;
+        open_.push_back(true);
+    }
+    void End(char bracket) {
+        const bool empty = open_.back();
+        open_.pop_back();
+        if (!empty)
+            out_ << '\n' << std::string(kIndent * open_.size(), ' ');
+        out_ << bracket;
+    }
+    // Starts the next member or element of the open object or array on a line of its own.
+    void Next() {
+        out_ << (open_.back() ? "\n" : ",\n") << std::string(kIndent * open_.size(), ' ');
+        open_.back() = false;
+    }
+
+    std::ostream& out_;
+    std::string text_;  // the value last serialized, its buffer used again
+    nlohmann::detail::serializer<nlohmann::ordered_json> serializer_;
+    std::vector<bool> open_;  // per open object or array: nothing in it yet
+    bool keyed_ = false;      // a key was written and waits for its value
+};
+
 }  // namespace
 
 int ExitStatusOf(const RunRecord& record, FailOn failOn) {
@@ -273,48 +367,34 @@ std::string SummaryLine(const RunRecord& record, const Presentation& presentatio
 
 void WriteText(std::ostream& out, const RunRecord& record, const Presentation& presentation) {
     const Prepared prepared(record, presentation);
-    std::ostringstream body;
+    // Written straight to the stream; a blank line between what is listed and the summary,
+    // when anything is.
+    bool listed = true;
     if (presentation.statistics) {
-        WriteStatistics(body, prepared);
+        WriteStatistics(out, prepared);
     } else {
-        WriteListing(body, prepared, Listing::NotIgnored);
+        listed = WriteListing(out, prepared, Listing::NotIgnored);
         if (!prepared.View(Listing::Ignored, ResultOrder::RunOrder, GroupBy::None).shown.empty()) {
-            body << "\nIgnored results:\n";
-            WriteListing(body, prepared, Listing::Ignored);
+            out << "\nIgnored results:\n";
+            WriteListing(out, prepared, Listing::Ignored);
+            listed = true;
         }
     }
-    // A blank line between what is listed and the summary, when anything is.
-    if (const std::string listed = body.str(); !listed.empty())
-        out << listed << "\n";
+    if (listed)
+        out << "\n";
     out << SummaryOf(prepared, record) << "\n";
 }
 
 void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& presentation) {
     const Prepared prepared(record, presentation);
     const ResultGrouping& grouping = prepared.Grouping();
+    const ResultView listed = prepared.View(Listing::All, ResultOrder::RunOrder, GroupBy::None);
+    const SeverityCounts counts = grouping.Counts(Listing::NotIgnored);
 
     nlohmann::ordered_json target;
     target["kind"] = TargetKindName(record.target);
     if (record.target != TargetKind::Schedule)
         target["file"] = record.targetFile;
-
-    const ResultView listed = prepared.View(Listing::All, ResultOrder::RunOrder, GroupBy::None);
-    std::unordered_map<std::size_t, std::size_t> position;
-    nlohmann::ordered_json results = nlohmann::ordered_json::array();
-    for (const std::size_t i : listed.shown) {
-        const Result& result = *grouping.At(i);
-        position[i] = results.size();
-        nlohmann::ordered_json item;
-        item["severity"] = static_cast<int32_t>(result.Severity());
-        item["severityText"] = result.SeverityText();
-        item["messageNumber"] = result.MessageNumber();
-        item["helpContextId"] = result.HelpContextID();
-        item["summary"] = result.Summary();
-        item["details"] = result.Details();
-        item["ignored"] = grouping.Ignored(i);
-        item["ignoreKey"] = IgnoreKeyText::Encode(result.IgnoreKey());
-        results.push_back(std::move(item));
-    }
 
     nlohmann::ordered_json store;
     store["path"] = record.store.file ? nlohmann::ordered_json(*record.store.file) : nullptr;
@@ -323,49 +403,81 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
     store["understood"] = record.store.condition.understood;
     store["readOnly"] = record.store.condition.readOnly;
 
-    const SeverityCounts counts = grouping.Counts(Listing::NotIgnored);
-    nlohmann::ordered_json document;
-    document["program"] = "vantori-verify";
-    document["version"] = kVersionText;
-    document["target"] = std::move(target);
-    document["store"] = std::move(store);
-    document["cancelled"] = record.cancelled;
-    document["checksPerformed"] = record.checksPerformed;
-    document["errors"] = counts.errors;
-    document["warnings"] = counts.warnings;
-    document["counts"] = CountsJson(counts, grouping.Counts(Listing::Ignored).Total());
+    JsonWriter json(out);
+    json.BeginObject();
+    json.Member("program", "vantori-verify");
+    json.Member("version", kVersionText);
+    json.Member("target", target);
+    json.Member("store", store);
+    json.Member("cancelled", record.cancelled);
+    json.Member("checksPerformed", record.checksPerformed);
+    json.Member("errors", counts.errors);
+    json.Member("warnings", counts.warnings);
+    json.Member("counts", CountsJson(counts, grouping.Counts(Listing::Ignored).Total()));
     if (presentation.minimumSeverity != Severity::Info) {
-        document["severity"] = LowerSeverityText(presentation.minimumSeverity);
-        document["hidden"] = listed.hidden;
+        json.Member("severity", LowerSeverityText(presentation.minimumSeverity));
+        json.Member("hidden", listed.hidden);
     }
     if (presentation.baselineFile) {
-        document["baseline"] = {{"file", *presentation.baselineFile},
-                                {"inBaseline", prepared.InBaseline()}};
+        json.Member("baseline",
+                    {{"file", *presentation.baselineFile}, {"inBaseline", prepared.InBaseline()}});
     }
-    document["results"] = std::move(results);
+
+    // The results one at a time, each its own small document.
+    json.Key("results");
+    json.BeginArray();
+    for (const std::size_t i : listed.shown) {
+        const Result& result = *grouping.At(i);
+        json.BeginObject();
+        json.Key("severity");
+        json.Number(static_cast<int32_t>(result.Severity()));
+        json.Key("severityText");
+        json.Text(result.SeverityText());
+        json.Key("messageNumber");
+        json.Number(result.MessageNumber());
+        json.Key("helpContextId");
+        json.Number(result.HelpContextID());
+        json.Key("summary");
+        json.Text(result.Summary());
+        json.Key("details");
+        json.BeginArray();
+        for (const std::string& detail : result.Details())
+            json.Text(detail);
+        json.EndArray();
+        json.Key("ignored");
+        json.Bool(grouping.Ignored(i));
+        json.Key("ignoreKey");
+        json.Text(IgnoreKeyText::Encode(result.IgnoreKey()));
+        json.EndObject();
+    }
+    json.EndArray();
 
     if (presentation.groupBy != GroupBy::None) {
-        nlohmann::ordered_json groups = nlohmann::ordered_json::array();
+        json.Key("groups");
+        json.BeginArray();
         for (const ResultGroup& group :
              prepared.View(Listing::All, ResultOrder::RunOrder, presentation.groupBy).groups) {
             SeverityCounts groupCounts;
             int64_t ignored = 0;
             nlohmann::ordered_json members = nlohmann::ordered_json::array();
             for (const std::size_t i : group.members) {
-                members.push_back(position.at(i));
+                // Where the result stands in "results", which lists them in run order.
+                members.push_back(static_cast<std::size_t>(
+                    std::lower_bound(listed.shown.begin(), listed.shown.end(), i) -
+                    listed.shown.begin()));
                 if (grouping.Ignored(i))
                     ++ignored;
                 else
                     groupCounts.Add(grouping.At(i)->Severity());
             }
-            nlohmann::ordered_json item;
-            item["key"] = IgnoreKeyText::Encode(group.key);
-            item["title"] = group.title;
-            item["counts"] = CountsJson(groupCounts, ignored);
-            item["results"] = std::move(members);
-            groups.push_back(std::move(item));
+            nlohmann::ordered_json entry;
+            entry["key"] = IgnoreKeyText::Encode(group.key);
+            entry["title"] = group.title;
+            entry["counts"] = CountsJson(groupCounts, ignored);
+            entry["results"] = std::move(members);
+            json.Value(entry);
         }
-        document["groups"] = std::move(groups);
+        json.EndArray();
     }
     if (presentation.statistics) {
         nlohmann::ordered_json statistics = nlohmann::ordered_json::array();
@@ -377,9 +489,10 @@ void WriteJson(std::ostream& out, const RunRecord& record, const Presentation& p
                                   {"count", statistic.count},
                                   {"summary", statistic.summary}});
         }
-        document["statistics"] = std::move(statistics);
+        json.Member("statistics", statistics);
     }
-    out << document.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace) << "\n";
+    json.EndObject();
+    out << "\n";
 }
 
 }  // namespace vtr::cli

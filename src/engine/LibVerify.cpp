@@ -5,14 +5,18 @@
 #include <exception>
 #include <memory>
 #include <optional>
+#include <thread>
 #include <unordered_map>
 #include <unordered_set>
 #include <utility>
 
+#include "checks/conflicts/CheckIntersequenceConflicts.h"
 #include "checks/installation/CheckOldKRP.h"
 #include "checks/installation/CheckPostInstall.h"
 #include "checks/installation/CheckWMP.h"
+#include "checks/sequence/CheckSequenceLoads.h"
 #include "engine/IgnoreLists.h"
+#include "engine/SequencePrefetch.h"
 #include "engine/VtrError.h"
 #include "environment/FilesRead.h"
 #include "environment/LibFile.h"
@@ -110,8 +114,11 @@ struct VerificationState {
     YearSchedulePtr yearlySchedule;
     std::string yearlyScheduleFile;
     FileLoadCounts loadCounts;
-    RunInfo selected;  // the target as selected, without the times
-    RunInfo run;       // the target and times of the current (or last) run
+    RunInfo selected;     // the target as selected, without the times
+    RunInfo run;          // the target and times of the current (or last) run
+    int loadingJobs = 0;  // 0: every processor
+    // Loads sequences ahead of the queue while a run goes, with more than one job.
+    std::unique_ptr<SequencePrefetch> prefetch;
 
     VerificationState() = default;
     VerificationState(const VerificationState&) = delete;
@@ -153,6 +160,27 @@ void Broadcast(Operation&& operation) {
 }
 
 constexpr std::size_t kMaxDetails = 9;
+
+// How many files the workers load beyond those the checks have taken, per worker: enough
+// to keep them busy while the checks of one file run, few enough to bound the memory of
+// sequences loaded and not yet asked for.
+constexpr std::size_t kFilesAheadPerWorker = 2;
+
+// The sequence files a check just queued will load, in the order it loads them, as far as is
+// known when it is queued. A wrong guess costs time, never a result: the first check to ask
+// for each file is the one that loads a sequence, and for a show the intersequence check
+// asks for all of its sequences before their own checks run.
+std::vector<std::string> SequenceFilesOf(ICheck& check, const VerificationState& state) {
+    if (auto* loads = dynamic_cast<CheckSequenceLoads*>(&check))
+        return {loads->Filename()};
+    if (auto* conflicts = dynamic_cast<CheckIntersequenceConflicts*>(&check)) {
+        // Its show was read by the check that queued it.
+        const auto show = state.showCache.find(conflicts->ShowFilename());
+        if (show != state.showCache.end() && show->second)
+            return conflicts->SequenceFiles(*show->second);
+    }
+    return {};
+}
 
 // The week time that the temporary schedule of a single show starts and ends at: day 1,
 // 3:00:37 and 7:00:37. The odd second keeps the times apart from anything a user schedules
@@ -423,6 +451,12 @@ void RunVerification() {
     state.run.finishedUtc = state.run.startedUtc;
 
     ResumeStep([] { BeginVerification(); });
+    if (const int jobs = LoadingJobs(); jobs > 1) {
+        state.prefetch = std::make_unique<SequencePrefetch>(
+            jobs, kFilesAheadPerWorker * static_cast<std::size_t>(jobs));
+        // The root checks queued by BeginVerification load no sequence: the files are named
+        // by the checks queued from here on.
+    }
 
     while (!state.pendingChecks.Empty()) {
         const CheckPtr check = state.pendingChecks.Front();
@@ -439,6 +473,7 @@ void RunVerification() {
         Broadcast([&](INotificationClient& client) { client.CheckCompleted(*check); });
         ProcessPendingEvents();
     }
+    state.prefetch.reset();  // stops and waits for the workers
 
     ResumeStep([&] {
         if (state.errors.empty() && state.warnings.empty())
@@ -456,10 +491,23 @@ void RunVerification() {
 void CancelVerification() {
     VerificationState& state = State();
     state.cancelled = true;
+    if (state.prefetch)
+        state.prefetch->Stop();
     AddResult(Messages::VerificationCancelled);
     while (!state.pendingChecks.Empty())
         state.pendingChecks.RemoveFront();
     Broadcast([](INotificationClient& client) { client.VerificationCancelled(); });
+}
+
+void SetLoadingJobs(int jobs) {
+    State().loadingJobs = std::max(jobs, 0);
+}
+
+int LoadingJobs() {
+    const int jobs = State().loadingJobs;
+    if (jobs > 0)
+        return jobs;
+    return std::max(1, static_cast<int>(std::thread::hardware_concurrency()));
 }
 
 bool IsVerifying() {
@@ -481,6 +529,14 @@ void AddCheck(CheckPtr check) noexcept {
         if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
             return;
         state.pendingChecks.Append(std::move(id), check);
+        if (state.prefetch) {
+            ResumeStep([&] {
+                for (const std::string& file : SequenceFilesOf(*check, state)) {
+                    if (!file.empty() && state.sequenceCache.count(file) == 0)
+                        state.prefetch->Want(file);
+                }
+            });
+        }
         Broadcast([&](INotificationClient& client) { client.CheckAdded(*check); });
     });
 }
@@ -498,13 +554,34 @@ std::shared_ptr<seqlib::Sequence> LoadSequence(const std::string& fileName) {
     std::shared_ptr<seqlib::Sequence> sequence;
     std::string failure;
     bool failed = false;
-    try {
-        SequenceLoader loader;
-        sequence = loader.Load(fileName);
-    } catch (...) {
-        sequence = nullptr;
-        failed = true;
-        failure = DescribeException(std::current_exception());
+    std::optional<SequencePrefetch::Load> loaded;
+    if (state.prefetch)
+        loaded = state.prefetch->Take(fileName);
+    if (loaded) {
+        // Loaded by a worker: its progress is told now, as if loaded here, and a cancel seen
+        // at one of its percents stops it there, as it would have stopped a load made here.
+        bool stopped = false;
+        for (const int32_t percent : loaded->progress) {
+            SequenceLoader::TellProgress(fileName, percent);
+            if (state.cancelled && state.verifying) {
+                stopped = true;
+                break;
+            }
+        }
+        sequence = stopped ? nullptr : std::move(loaded->sequence);
+        if (loaded->failure && !stopped) {
+            failed = true;
+            failure = DescribeException(loaded->failure);
+        }
+    } else {
+        try {
+            SequenceLoader loader;
+            sequence = loader.Load(fileName);
+        } catch (...) {
+            sequence = nullptr;
+            failed = true;
+            failure = DescribeException(std::current_exception());
+        }
     }
     // A load stopped by a cancellation says nothing of the file: neither kept nor told.
     if (!sequence && !failed)

@@ -18,18 +18,22 @@ std::string SeverityText(Severity severity) {
 
 void Result::AddDetail(const std::string& detail) {
     details_.push_back(detail);
+    ignoreKey_.reset();
 }
 
 bool Result::Ignorable() const {
     return LibVerify::IsResultIgnored(*this);
 }
 
-std::string Result::IgnoreKey() const {
-    // Stored keys carry the trailing " / " after the last detail; it is part of the key.
-    std::string key = std::to_string(messageNumber_) + "-";
-    for (const std::string& detail : details_)
-        key += detail + " / ";
-    return key;
+const std::string& Result::IgnoreKey() const {
+    if (!ignoreKey_) {
+        // Stored keys carry the trailing " / " after the last detail; it is part of the key.
+        std::string key = std::to_string(messageNumber_) + "-";
+        for (const std::string& detail : details_)
+            key.append(detail).append(" / ");
+        ignoreKey_ = std::move(key);
+    }
+    return *ignoreKey_;
 }
 
 std::string Result::SeverityText() const {

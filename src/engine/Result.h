@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -22,7 +23,10 @@ public:
     int32_t HelpContextID() const { return helpContextId_; }
     void SetHelpContextID(int32_t id) { helpContextId_ = id; }
     int32_t MessageNumber() const { return messageNumber_; }
-    void SetMessageNumber(int32_t number) { messageNumber_ = number; }
+    void SetMessageNumber(int32_t number) {
+        messageNumber_ = number;
+        ignoreKey_.reset();
+    }
     vtr::Severity Severity() const { return severity_; }
     void SetSeverity(vtr::Severity severity) { severity_ = severity; }
     const std::string& Summary() const { return summary_; }
@@ -30,8 +34,9 @@ public:
 
     // True while the result matches an entry of the ignore lists (asked afresh each time).
     bool Ignorable() const;
-    // Message number, "-", then each detail followed by " / ".
-    std::string IgnoreKey() const;
+    // Message number, "-", then each detail followed by " / ". Worked out when first asked
+    // for and kept until the number or the details change.
+    const std::string& IgnoreKey() const;
     std::string SeverityText() const;
 
 private:
@@ -40,6 +45,7 @@ private:
     int32_t messageNumber_ = 0;
     vtr::Severity severity_ = vtr::Severity::Info;
     std::string summary_;
+    mutable std::optional<std::string> ignoreKey_;
 };
 
 using ResultPtr = std::shared_ptr<Result>;

@@ -300,8 +300,13 @@ int32_t ResultGrouping::Headings::Intern(std::string_view name, Identify identif
 std::size_t ResultGrouping::Add(ResultPtr result, bool ignored) {
     Entry entry;
     entry.ignored = ignored;
-    const Result& r = *result;
+    entry.result = std::move(result);
+    entries_.push_back(std::move(entry));
+    return entries_.size() - 1;
+}
 
+void ResultGrouping::Fold(Entry& entry) {
+    const Result& r = *entry.result;
     std::size_t length = r.Summary().size();
     for (const std::string& detail : r.Details())
         length += detail.size() + 1;
@@ -311,7 +316,10 @@ std::size_t ResultGrouping::Add(ResultPtr result, bool ignored) {
         entry.folded += '\n';
         FoldInto(entry.folded, detail);
     }
+}
 
+void ResultGrouping::Head(Entry& entry) const {
+    const Result& r = *entry.result;
     const int32_t number = r.MessageNumber();
     Headings& messages = headings_[Slot(GroupBy::Message)];
     const auto [message, newMessage] = messageHeadings_.emplace(number, 0);
@@ -371,10 +379,16 @@ std::size_t ResultGrouping::Add(ResultPtr result, bool ignored) {
         });
     }
     entry.heading[Slot(GroupBy::SequencePair)] = pair;
+}
 
-    entry.result = std::move(result);
-    entries_.push_back(std::move(entry));
-    return entries_.size() - 1;
+void ResultGrouping::FoldAll() const {
+    for (; folded_ < entries_.size(); ++folded_)
+        Fold(entries_[folded_]);
+}
+
+void ResultGrouping::HeadAll() const {
+    for (; headed_ < entries_.size(); ++headed_)
+        Head(entries_[headed_]);
 }
 
 void ResultGrouping::SetIgnored(std::size_t index, bool ignored) {
@@ -383,6 +397,8 @@ void ResultGrouping::SetIgnored(std::size_t index, bool ignored) {
 
 void ResultGrouping::Clear() {
     entries_.clear();
+    folded_ = 0;
+    headed_ = 0;
     for (Headings& headings : headings_)
         headings = Headings();
     messageHeadings_.clear();
@@ -407,12 +423,15 @@ bool ResultGrouping::Matches(const Entry& entry, const ResultFilter& filter,
 }
 
 bool ResultGrouping::Passes(std::size_t index, const ResultFilter& filter) const {
+    if (!filter.text.empty())
+        FoldAll();
     return Matches(entries_[index], filter, FoldCase(filter.text));
 }
 
 GroupIdentity ResultGrouping::GroupOf(std::size_t index, GroupBy groupBy) const {
     if (groupBy == GroupBy::None)
         return {};
+    HeadAll();
     const int slot = Slot(groupBy);
     return headings_[slot].identities[entries_[index].heading[slot]];
 }
@@ -420,6 +439,8 @@ GroupIdentity ResultGrouping::GroupOf(std::size_t index, GroupBy groupBy) const 
 ResultView ResultGrouping::View(const ResultQuery& query) const {
     ResultView view;
     const std::string needle = FoldCase(query.filter.text);
+    if (!needle.empty())
+        FoldAll();
 
     // The shown results in the order asked for: one run per severity rank for errors first.
     std::array<std::vector<std::size_t>, 4> byRank;
@@ -444,6 +465,7 @@ ResultView ResultGrouping::View(const ResultQuery& query) const {
         return view;
     }
 
+    HeadAll();
     const int slot = Slot(query.groupBy);
     const Headings& headings = headings_[slot];
     std::vector<int32_t> groupOfHeading(headings.identities.size(), -1);

@@ -16,7 +16,9 @@
 // command line's listings, the window's lists and the shared reports all use it.
 //
 // A ResultGrouping holds the results by their index, 0 for the first one added, and reads
-// each result's details once, when it is added; the results must not change afterwards.
+// each result's details once: for its headings when the first grouped view asks, for the
+// text filter when the first filter with a text asks (an output that neither groups nor
+// filters by text never reads them). The results must not change once added.
 // Every answer is a list of indices, so a front end can keep its own rows beside them.
 namespace vtr {
 
@@ -169,13 +171,24 @@ class ResultGrouping {
         int32_t heading[4] = {};  // per grouping, in the order of GroupBy but None
     };
 
+    // The entry's folded text, and its headings (interned in the order of the entries, so
+    // that the headings are numbered as the results came).
+    static void Fold(Entry& entry);
+    void Head(Entry& entry) const;
+    // Brings the folded texts, or the headings, up to the last entry added.
+    void FoldAll() const;
+    void HeadAll() const;
+
     static bool InListing(const Entry& entry, Listing listing);
     bool Matches(const Entry& entry, const ResultFilter& filter, std::string_view needle) const;
 
-    std::vector<Entry> entries_;
-    Headings headings_[4];
-    std::unordered_map<int32_t, int32_t> messageHeadings_;  // message number to heading
-    std::string scratch_;                                   // a pair's name while it is made
+    // Mutable: the folded texts and headings are worked out when first asked for.
+    mutable std::vector<Entry> entries_;
+    mutable std::size_t folded_ = 0;  // entries whose text is folded
+    mutable std::size_t headed_ = 0;  // entries whose headings are known
+    mutable Headings headings_[4];
+    mutable std::unordered_map<int32_t, int32_t> messageHeadings_;  // message number to heading
+    mutable std::string scratch_;  // a pair's name while it is made
 };
 
 // A count with thousands separated by commas: "2,491".

@@ -34,9 +34,13 @@ std::shared_ptr<seqlib::Sequence> SequenceLoader::Load(const std::string& fileNa
 }
 
 void SequenceLoader::OnProgress(int32_t percent) {
-    LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName_);
-    LibVerify::ProcessPendingEvents();
+    TellProgress(fileName_, percent);
     justPumped_ = true;
+}
+
+void SequenceLoader::TellProgress(const std::string& fileName, int32_t percent) {
+    LibVerify::PostTransientMessage("Loading " + std::to_string(percent) + "% of " + fileName);
+    LibVerify::ProcessPendingEvents();
 }
 
 // Asked after each percent (whose text has just let the user interface in) and after

@@ -31,6 +31,11 @@ class SequenceLoader {
     // unchanged.
     std::shared_ptr<seqlib::Sequence> Load(const std::string& fileName);
 
+    // Tells the clients that the load of that file is `percent` done and lets the user
+    // interface process its events: what a load does at each step of its progress (also
+    // for a load made on another thread, told when the caller takes it).
+    static void TellProgress(const std::string& fileName, int32_t percent);
+
   private:
     void OnProgress(int32_t percent);
     bool KeepGoing();

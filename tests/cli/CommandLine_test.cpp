@@ -275,5 +275,25 @@ TEST(CommandLineTest, TriageOptionsAreReadInAnyLetterCase) {
         Severity::Info);
 }
 
+TEST(CommandLineTest, JobsTakeAWholeNumberOfProcessorsForAVerificationOnly) {
+    EXPECT_EQ(Parse({"--schedule"}).options->jobs, 0);  // every processor
+    EXPECT_EQ(Parse({"--schedule", "--jobs", "1"}).options->jobs, 1);
+    EXPECT_EQ(Parse({"--show", "a.lss", "--jobs", "12"}).options->jobs, 12);
+    for (const char* text : {"0", "-2", "two", "3x", "", "257"}) {
+        const std::string wrong = text;
+        EXPECT_EQ(UsageError({"--schedule", "--jobs", wrong}),
+                  "vantori-verify: --jobs needs a number of processors from 1 to 256, not \"" +
+                      wrong + "\"" + kMoreHelp)
+            << wrong;
+    }
+    EXPECT_THAT(UsageError({"ignored", "--jobs", "2"}),
+                HasSubstr("\"ignored\" cannot be combined with --jobs"));
+
+    std::string out;
+    std::string err;
+    Parse({"--help"}, &out, &err);
+    EXPECT_THAT(out, HasSubstr("--jobs N"));
+}
+
 }  // namespace
 }  // namespace vtr::cli

@@ -370,6 +370,75 @@ TEST(ResultsOutputTest, JsonOfTheScheduleHasNoFileAndCarriesEveryKeyExactly) {
     EXPECT_EQ(Json(record)["target"]["kind"], "sequence");
 }
 
+// The JSON is written a piece at a time; it must read byte for byte as the whole document
+// laid out with an indent of two.
+TEST(ResultsOutputTest, JsonIsLaidOutExactlyAsTheWholeDocumentDumped) {
+    RunRecord empty;
+    empty.target = TargetKind::Schedule;
+    empty.store.file = "/tmp/store.reg";
+    std::ostringstream out;
+    WriteJson(out, empty);
+    EXPECT_EQ(out.str(), std::string("{\n"
+                                     "  \"program\": \"vantori-verify\",\n"
+                                     "  \"version\": \"") +
+                             kVersionText +
+                             "\",\n"
+                             "  \"target\": {\n"
+                             "    \"kind\": \"schedule\"\n"
+                             "  },\n"
+                             "  \"store\": {\n"
+                             "    \"path\": \"/tmp/store.reg\",\n"
+                             "    \"chosenBy\": \"option\",\n"
+                             "    \"exists\": true,\n"
+                             "    \"understood\": true,\n"
+                             "    \"readOnly\": false\n"
+                             "  },\n"
+                             "  \"cancelled\": false,\n"
+                             "  \"checksPerformed\": 0,\n"
+                             "  \"errors\": 0,\n"
+                             "  \"warnings\": 0,\n"
+                             "  \"counts\": {\n"
+                             "    \"errors\": 0,\n"
+                             "    \"warnings\": 0,\n"
+                             "    \"info\": 0,\n"
+                             "    \"ignored\": 0\n"
+                             "  },\n"
+                             "  \"results\": []\n"
+                             "}\n");
+
+    RunRecord record = SampleRecord();
+    record.results.push_back({MakeResult(Severity::Error, 21, 21, "Show file does not exist",
+                                         {std::string("C:\\Shows\\No\xebl.lss"), "two\nlines",
+                                          "a \"quoted\"\tname\x7f", "caf\xc3\xa9", ""}),
+                              false});
+    record.results.push_back({Conflict("A.lss", "a.las", "b.las", "Star"), false, true});
+    std::vector<Presentation> presentations(4);
+    presentations[1].minimumSeverity = Severity::Warning;
+    presentations[1].baselineFile = "/nightly/last.json";
+    presentations[2].groupBy = GroupBy::SequencePair;
+    presentations[2].statistics = true;
+    presentations[3].groupBy = GroupBy::Message;
+    presentations[3].minimumSeverity = Severity::Error;
+    for (const Presentation& presentation : presentations) {
+        std::ostringstream written;
+        WriteJson(written, record, presentation);
+        const std::string text = written.str();
+        EXPECT_EQ(text, nlohmann::ordered_json::parse(text).dump(2) + "\n");
+    }
+}
+
+TEST(ResultsOutputTest, TextOfARunWithNothingListedIsTheSummaryAlone) {
+    RunRecord record;
+    record.checksPerformed = 3;
+    EXPECT_EQ(Text(record), "3 checks performed, 0 errors, 0 warnings, 0 ignored results.\n");
+    record.results = {{MakeResult(Severity::Info, 1, 1, "No errors or warnings found"), true}};
+    EXPECT_EQ(Text(record),
+              "\nIgnored results:\n"
+              "Info 1: No errors or warnings found\n"
+              "\n"
+              "3 checks performed, 0 errors, 0 warnings, 1 ignored result.\n");
+}
+
 TEST(ResultsOutputTest, TheExitStatusFollowsTheWorstCountedSeverityAndFailOn) {
     const auto status = [](std::vector<RecordedResult> results, FailOn failOn) {
         RunRecord record;

@@ -41,6 +41,12 @@ TEST(Result, IgnoreKeyIsTheNumberThenEachDetailWithItsTrailingSeparator) {
     bare.SetMessageNumber(20);
     EXPECT_EQ(bare.IgnoreKey(), "20-");
     EXPECT_THAT(bare.Details(), IsEmpty());
+
+    // The key asked for once is kept, and follows a later detail or number.
+    bare.AddDetail("C");
+    EXPECT_EQ(bare.IgnoreKey(), "20-C / ");
+    bare.SetMessageNumber(21);
+    EXPECT_EQ(bare.IgnoreKey(), "21-C / ");
 }
 
 TEST(CheckUtils, IdentifierIsTheTypeThenTheParameterUnchanged) {

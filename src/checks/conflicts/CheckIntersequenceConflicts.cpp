@@ -323,6 +323,51 @@ std::string CheckIntersequenceConflicts::SectionName(int32_t flag) {
     }
 }
 
+namespace {
+
+// Calls visit(section flag, listed name) for every sequence name of the show in the order
+// the sequences are walked: each playlist's list and then its clean-up sequence, section by
+// section, then the interactive sets.
+template <typename Visit>
+void ForEachListed(const Show& show, Visit&& visit) {
+    const auto visitPlaylist = [&](int32_t flag, const PlaylistPtr& playlist) {
+        if (!playlist)
+            return;
+        for (const std::string& name : playlist->List())
+            visit(flag, name);
+        visit(flag, playlist->CleanUp());
+    };
+    visitPlaylist(kBackground, show.Background());
+    visitPlaylist(kStartup, show.Startup());
+    visitPlaylist(kAnimation, show.Main());
+    visitPlaylist(kMusical, show.Musical());
+    visitPlaylist(kShutdown, show.Shutdown());
+    for (const auto& group : show.InteractiveGroups()) {
+        if (!group)
+            continue;
+        for (const auto& set : group->TriggeredSets()) {
+            if (!set)
+                continue;
+            for (const std::string& name : set->Sequences())
+                visit(kInteractive, name);
+        }
+    }
+}
+
+}  // namespace
+
+std::vector<std::string> CheckIntersequenceConflicts::SequenceFiles(const Show& show) const {
+    std::vector<std::string> files;
+    ForEachListed(show, [&](int32_t, const std::string& name) {
+        // An edit file names its playback file only when read, and reading it reports what
+        // is wrong with it: that is the walk's to do, in its turn, so its sequence is left to
+        // be loaded then.
+        if (!name.empty() && !CheckSequenceFileExists::IsEditFile(name))
+            files.push_back(name);
+    });
+    return files;
+}
+
 void CheckIntersequenceConflicts::Check() {
     const auto show =
         ResumeOr(std::shared_ptr<Show>(), [&] { return LibVerify::LoadShow(filename_); });
@@ -330,29 +375,9 @@ void CheckIntersequenceConflicts::Check() {
         return;  // CheckLoadShowFile reports a show that cannot be loaded
     const int32_t animationType = show->Main() ? show->Main()->AnimationType() : 0;
     IntersequenceWalk walk(filename_, animationType);
-
-    const auto walkPlaylist = [&](int32_t flag, const PlaylistPtr& playlist) {
-        if (!playlist)
-            return;
-        for (const std::string& name : playlist->List())
-            ResumeStep([&] { walk.WalkSequence(flag, name); });
-        ResumeStep([&] { walk.WalkSequence(flag, playlist->CleanUp()); });
-    };
-    walkPlaylist(kBackground, show->Background());
-    walkPlaylist(kStartup, show->Startup());
-    walkPlaylist(kAnimation, show->Main());
-    walkPlaylist(kMusical, show->Musical());
-    walkPlaylist(kShutdown, show->Shutdown());
-    for (const auto& group : show->InteractiveGroups()) {
-        if (!group)
-            continue;
-        for (const auto& set : group->TriggeredSets()) {
-            if (!set)
-                continue;
-            for (const std::string& name : set->Sequences())
-                ResumeStep([&] { walk.WalkSequence(kInteractive, name); });
-        }
-    }
+    ForEachListed(*show, [&](int32_t flag, const std::string& name) {
+        ResumeStep([&] { walk.WalkSequence(flag, name); });
+    });
 }
 
 }  // namespace vtr

@@ -3,10 +3,13 @@
 #include <cstdint>
 #include <string>
 #include <utility>
+#include <vector>
 
 #include "checks/common/FileCheck.h"
 
 namespace vtr {
+
+class Show;
 
 // Finds channels and intensity-file circuits used by sequences of two sections of a show
 // that can play at the same time (messages 43, 47 and 48). The show player runs the
@@ -23,6 +26,9 @@ class CheckIntersequenceConflicts : public FileCheck {
     void SetShowFilename(std::string showFilename) { SetFilename(std::move(showFilename)); }
 
     void Check() override;
+    // The sequence files the check loads for that show, in the order it walks them (the
+    // driver has them loaded ahead on other threads).
+    std::vector<std::string> SequenceFiles(const Show& show) const;
 
     // The name of a section flag in results: 1 "Background", 2 "Startup", 4 "Animation",
     // 8 "Musical", 16 "Interactive", 32 "Shutdown"; any other "(" + the number + ")".
