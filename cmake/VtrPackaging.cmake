@@ -61,6 +61,16 @@ if(WIN32)
     set(CPACK_NSIS_PACKAGE_NAME "Vantori Verifier")
     set(CPACK_NSIS_DISPLAY_NAME "Vantori Verifier")
     set(CPACK_NSIS_CONTACT "${CPACK_PACKAGE_CONTACT}")
+    # A 64-bit installer, as the programs are (NSIS makes 32-bit ones unless told), with the
+    # Unicode strings of the program folder's and Start menu's names. The uninstaller deletes
+    # the installer's key, Software\<vendor>\Vantori Verifier, but leaves the vendor's key
+    # above it: once everything else is gone, it goes too when nothing else is in it.
+    set(CPACK_NSIS_DEFINES
+        "  Target amd64-unicode\n\
+Function un.onUninstSuccess\n\
+  DeleteRegKey /ifempty HKLM 'Software\\${CPACK_PACKAGE_VENDOR}'\n\
+  DeleteRegKey /ifempty HKCU 'Software\\${CPACK_PACKAGE_VENDOR}'\n\
+FunctionEnd")
     set(CPACK_NSIS_MUI_ICON ${VTR_PACKAGING_DIR}/icons/vantori-verifier.ico)
     set(CPACK_NSIS_MUI_UNIICON ${VTR_PACKAGING_DIR}/icons/vantori-verifier.ico)
     set(CPACK_NSIS_INSTALLED_ICON_NAME vantori-verifier.exe)
@@ -79,6 +89,8 @@ if(WIN32)
     # the user who uninstalls (and its folder when nothing else is in it). The suite's
     # settings are never touched.
     file(READ ${VTR_PACKAGING_DIR}/windows/uninstall-extra.nsh CPACK_NSIS_EXTRA_UNINSTALL_COMMANDS)
+    set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS
+                 ${VTR_PACKAGING_DIR}/windows/uninstall-extra.nsh)
     # The ZIP holds one folder, named as the file.
     set(CPACK_INCLUDE_TOPLEVEL_DIRECTORY ON)
 else()

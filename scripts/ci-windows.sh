@@ -141,4 +141,25 @@ if ! diff "$work/temp-before" "$work/temp-after"; then
     failed=1
 fi
 [ "$failed" -eq 0 ] || exit 1
+
+step "installer and portable zip"
+# From what the build made (cpack installs the build, stripped, into a folder of its own).
+rm -f "$build"/vantori-verifier-*-win64.exe "$build"/vantori-verifier-*-win64.zip
+(cd "$build" && cpack -G "NSIS64;ZIP" >"$build/cpack.log" 2>&1) || {
+    echo "windows: cpack failed:" >&2
+    tail -n 40 "$build/cpack.log" >&2
+    exit 1
+}
+installer=$(find "$build" -maxdepth 1 -name 'vantori-verifier-*-win64.exe')
+portable=$(find "$build" -maxdepth 1 -name 'vantori-verifier-*-win64.zip')
+ls -l "$installer" "$portable"
+
+step "the installer under Wine, in a fresh prefix"
+# The same settings as above (the demo's folders as Windows names them), and the Linux
+# results to compare with.
+stop_wine
+"$root/scripts/windows-installer-test.sh" --prefix "$build/installer-prefix" \
+    --installer "$installer" --zip "$portable" --registry "$work/registry.reg" \
+    --expect "$work/linux.json" --expect-status "$linux_status" \
+    --screenshot "$build/verifier-window-wine.png"
 step "done"
