@@ -176,49 +176,48 @@ BENCHMARK(BM_LoadEverySequence)->UseManualTime()->Iterations(3)->Unit(benchmark:
 
 #if defined(VTR_BENCH_CHILD_PROCESS) && defined(VTR_VERIFY_PROGRAM)
 
-void BM_VerifyEntireSchedule(benchmark::State& state) {
+// Verifies the installation's schedule once per iteration, with the extra arguments, and
+// keeps the best run (by processor time, or by wall-clock time) and the highest peak.
+enum class Best { ProcessorTime, WallTime };
+void MeasureVerifications(benchmark::State& state, const std::vector<std::string>& extra, Best by,
+                          std::optional<ChildRun>& best, std::uint64_t& peakBytes) {
+    std::vector<std::string> args = {VTR_VERIFY_PROGRAM, "--schedule",
+                                     "--registry",       fixture->installation.registryFile,
+                                     "--format",         "json"};
+    args.insert(args.end(), extra.begin(), extra.end());
+    const auto cost = [by](const ChildRun& run) {
+        return by == Best::ProcessorTime ? run.processorSeconds : run.wallSeconds;
+    };
     for (auto _ : state) {
-        const auto run = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                              fixture->installation.registryFile, "--format",
-                                              "json", "--jobs", "1"});
+        const auto run = bench::MeasureChild(args);
         if (!run) {
             state.SkipWithError("the verifier could not be run");
             break;
         }
         state.SetIterationTime(run->wallSeconds);
-        if (!fixture->child || run->processorSeconds < fixture->child->processorSeconds)
-            fixture->child = run;
-        fixture->childPeakBytes = std::max(fixture->childPeakBytes, run->peakBytes);
+        if (!best || cost(*run) < cost(*best))
+            best = run;
+        peakBytes = std::max(peakBytes, run->peakBytes);
     }
+    if (best) {
+        state.counters["cpu_ms"] = best->processorSeconds * 1e3;
+        state.counters["peak_MB"] = static_cast<double>(peakBytes) / 1e6;
+    }
+}
+
+void BM_VerifyEntireSchedule(benchmark::State& state) {
+    MeasureVerifications(state, {"--jobs", "1"}, Best::ProcessorTime, fixture->child,
+                         fixture->childPeakBytes);
     if (const auto baseline = bench::MeasureChild({VTR_VERIFY_PROGRAM, "--version"}))
         fixture->baselinePeakBytes = baseline->peakBytes;
-    if (fixture->child) {
-        state.counters["cpu_ms"] = fixture->child->processorSeconds * 1e3;
+    if (fixture->child)
         state.counters["exit_status"] = fixture->child->status;
-        state.counters["peak_MB"] = static_cast<double>(fixture->childPeakBytes) / 1e6;
-    }
 }
 BENCHMARK(BM_VerifyEntireSchedule)->UseManualTime()->Iterations(3)->Unit(benchmark::kMillisecond);
 
 // The same verification with the sequence files loaded on every processor (the default).
 void BM_VerifyEntireScheduleEveryProcessor(benchmark::State& state) {
-    for (auto _ : state) {
-        const auto run =
-            bench::MeasureChild({VTR_VERIFY_PROGRAM, "--schedule", "--registry",
-                                 fixture->installation.registryFile, "--format", "json"});
-        if (!run) {
-            state.SkipWithError("the verifier could not be run");
-            break;
-        }
-        state.SetIterationTime(run->wallSeconds);
-        if (!fixture->parallel || run->wallSeconds < fixture->parallel->wallSeconds)
-            fixture->parallel = run;
-        fixture->parallelPeakBytes = std::max(fixture->parallelPeakBytes, run->peakBytes);
-    }
-    if (fixture->parallel) {
-        state.counters["cpu_ms"] = fixture->parallel->processorSeconds * 1e3;
-        state.counters["peak_MB"] = static_cast<double>(fixture->parallelPeakBytes) / 1e6;
-    }
+    MeasureVerifications(state, {}, Best::WallTime, fixture->parallel, fixture->parallelPeakBytes);
 }
 BENCHMARK(BM_VerifyEntireScheduleEveryProcessor)
     ->UseManualTime()
