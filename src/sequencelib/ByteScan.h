@@ -79,6 +79,32 @@ inline const char* FindTagEnd(const char* p, const char* end, char& quote) {
     return end;
 }
 
+// The first byte in [p, end) that is a control character (below 0x20), a quote, '<' or
+// '&': where a plain attribute value ends, or stops being plain. End when there is none.
+inline const char* FindValueStop(const char* p, const char* end) {
+#ifdef VTR_SCAN_SSE2
+    const __m128i control = _mm_set1_epi8(0x1F);
+    const __m128i dq = _mm_set1_epi8('"');
+    const __m128i sq = _mm_set1_epi8('\'');
+    const __m128i lt = _mm_set1_epi8('<');
+    const __m128i amp = _mm_set1_epi8('&');
+    for (; end - p >= 16; p += 16) {
+        const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+        const __m128i low = _mm_cmpeq_epi8(_mm_min_epu8(v, control), v);
+        const __m128i hits =
+            _mm_or_si128(_mm_or_si128(low, _mm_cmpeq_epi8(v, dq)),
+                         _mm_or_si128(_mm_cmpeq_epi8(v, sq),
+                                      _mm_or_si128(_mm_cmpeq_epi8(v, lt), _mm_cmpeq_epi8(v, amp))));
+        if (const auto mask = static_cast<unsigned>(_mm_movemask_epi8(hits)); mask != 0)
+            return p + std::countr_zero(mask);
+    }
+#endif
+    while (p < end && static_cast<unsigned char>(*p) >= 0x20 && *p != '"' && *p != '\'' &&
+           *p != '<' && *p != '&')
+        ++p;
+    return p;
+}
+
 // The first `c` in [p, end); end when there is none. Long runs go to memchr.
 inline const char* FindByte(const char* p, const char* end, char c) {
     const char* const near = end - p > 64 ? p + 64 : end;

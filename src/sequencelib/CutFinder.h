@@ -40,7 +40,10 @@ class CutFinder {
     CutFinder(TextWindow& window, MarkupLexer& lexer, const LineCounter& lines,
               std::size_t pieceBytes, std::size_t descendBytes, int32_t maxDepth);
 
-    // The content of the root element starts at `at`.
+    // Reading starts at `at`, a node boundary in the content of the innermost open element,
+    // with nothing known of what follows: the content of the root element starts there, or
+    // the reader has gone on without the finder. What the finder remembers only spares it
+    // reading again, so its cuts from `at` on are the same either way.
     void Start(int64_t at);
 
     // The next cut after `pos`, a node boundary in the content of the innermost of the

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "sequencelib/TextPlaces.h"
+#include "sequencelib/XmlElements.h"
 
 namespace vtr::seqlib::detail {
 
@@ -23,25 +24,26 @@ class PieceParser {
     PieceParser(const PieceParser&) = delete;
     PieceParser& operator=(const PieceParser&) = delete;
 
-    // The nodes of [from, to), parsed as a fragment (declarations and DOCTYPEs are kept as
-    // nodes, so that one where it does not belong is seen).
-    const pugi::xml_document& ParseNodes(int64_t from, int64_t to);
+    // The elements of the nodes of [from, to), parsed as a fragment, into `out`. A
+    // declaration or DOCTYPE among the nodes ends them: it is returned (the elements before
+    // it are in `out`), for the caller to refuse; else an empty node.
+    pugi::xml_node ParseNodes(int64_t from, int64_t to, XmlElements& out);
 
     // The element of the start tag [at, end) named `name`, parsed alone (closed by its end
-    // tag unless it is an empty-element tag): its attributes, no children.
-    pugi::xml_node ParseStartTag(int64_t at, int64_t end, bool emptyTag, std::string_view name);
-
-    // Where a node or attribute of the last parse stands (valid until the next parse, and
-    // while the window holds its text).
-    TextPlace PlaceOf(const pugi::xml_node& node) const;
-    TextPlace PlaceOf(const pugi::xml_attribute& attribute) const;
+    // tag unless it is an empty-element tag), into `out`: its attributes, no children.
+    void ParseStartTag(int64_t at, int64_t end, bool emptyTag, std::string_view name,
+                       XmlElements& out);
 
     [[noreturn]] void Fail(const pugi::xml_node& node, std::string cause) const;
 
   private:
     void Copy(int64_t from, int64_t to);
     void Parse(unsigned flags);
-    TextPlace PlaceInCopy(const char* p) const;
+    // The text offsets of what the last parse found.
+    int64_t OffsetInCopy(const char* p) const;
+    int64_t OffsetOf(const pugi::xml_node& node) const;
+    // Appends the element, and its descendant elements unless `alone`, to `out`.
+    void Flatten(const pugi::xml_node& element, bool alone, XmlElements& out) const;
 
     const TextWindow& window_;
     const LineCounter& lines_;

@@ -75,12 +75,15 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                     std::uint64_t maxKeptBytes)
         : sequence_(sequence), reader_(reader), maxKept_(maxKeptBytes) {}
 
-    void EnterElement(const pugi::xml_node& startTag) override {
+    void EnterElement(const detail::XmlElements& tag) override {
         const Context parent = stack_.empty() ? Context::Document : stack_.back();
-        stack_.push_back(Begin(parent, startTag));
+        stack_.push_back(Begin(parent, tag, tag[0]));
     }
 
-    void CompleteElement(const pugi::xml_node& element) override { Walk(stack_.back(), element); }
+    void CompleteElements(const detail::XmlElements& elements) override {
+        for (uint32_t i = 0; i < elements.Size(); i = elements[i].end)
+            Walk(stack_.back(), elements, i);
+    }
 
     void LeaveElement() override {
         End(stack_.back());
@@ -118,38 +121,32 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         detail::TextPlace place;
     };
 
-    // The name equals the literal (compared up to and with its terminating NUL, a byte at a
-    // time so that nothing past a shorter name is read; unrolled for the literal at hand).
-    template <std::size_t N>
-    static bool Is(const char* name, const char (&literal)[N]) {
-        return IsEach(name, literal, std::make_index_sequence<N>{});
-    }
-    template <std::size_t N, std::size_t... I>
-    static bool IsEach(const char* name, const char (&literal)[N], std::index_sequence<I...>) {
-        return ((name[I] == literal[I]) && ...);
-    }
+    using Elements = detail::XmlElements;
+    using Element = detail::XmlElement;
+    using Attribute = detail::XmlAttribute;
 
-    void Walk(Context parent, const pugi::xml_node& element) {
-        const Context context = Begin(parent, element);
+    static bool Is(std::string_view name, std::string_view literal) { return name == literal; }
+
+    // Only the elements the sequence is read from are walked into, a few levels deep.
+    void Walk(Context parent, const Elements& elements, uint32_t index) {
+        const Element& element = elements[index];
+        const Context context = Begin(parent, elements, element);
         if (context != Context::Ignored) {
-            for (pugi::xml_node child = element.first_child(); child;
-                 child = child.next_sibling()) {
-                if (child.type() == pugi::node_element)
-                    Walk(context, child);
-            }
+            for (uint32_t child = index + 1; child < element.end; child = elements[child].end)
+                Walk(context, elements, child);
         }
         End(context);
     }
 
-    Context Begin(Context parent, const pugi::xml_node& element) {
-        const char* name = element.name();
+    Context Begin(Context parent, const Elements& elements, const Element& element) {
+        const std::string_view name = element.name;
         switch (parent) {
             case Context::Document:
                 if (!Is(name, "sequence")) {
                     Fail(element,
-                         std::string("the root element is <") + name + ">, not <sequence>");
+                         "the root element is <" + std::string(name) + ">, not <sequence>");
                 }
-                ReadSequence(element);
+                ReadSequence(elements, element);
                 return Context::Sequence;
             case Context::Sequence:
                 if (Is(name, "channels"))
@@ -160,27 +157,27 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
             case Context::Channels:
                 if (!Is(name, "channel"))
                     return Context::Ignored;
-                BeginChannel(element);
+                BeginChannel(elements, element);
                 return Context::Channel;
             case Context::Channel:
                 if (Is(name, "event"))
-                    ReadEvent(element);
+                    ReadEvent(elements, element);
                 return Context::Ignored;
             case Context::Tracks:
                 if (!Is(name, "track"))
                     return Context::Ignored;
-                BeginTrack(element);
+                BeginTrack(elements, element);
                 return Context::Track;
             case Context::Track:
                 if (Is(name, "channelRef")) {
-                    ReadChannelRef(element);
-                } else if (Is(name, "intensityFile") && BeginIntensityFile(element)) {
+                    ReadChannelRef(elements, element);
+                } else if (Is(name, "intensityFile") && BeginIntensityFile(elements, element)) {
                     return Context::IntensityFile;
                 }
                 return Context::Ignored;
             case Context::IntensityFile:
                 if (Is(name, "device"))
-                    ReadDevice(element);
+                    ReadDevice(elements, element);
                 return Context::Ignored;
             case Context::Ignored:
                 return Context::Ignored;
@@ -204,6 +201,13 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
     }
 
+    // The value of the element's attribute of that name ("" when it has none).
+    static std::string_view ValueOf(const Elements& elements, const Element& element,
+                                    std::string_view name) {
+        const Attribute* attribute = elements.Find(element, name);
+        return attribute != nullptr ? attribute->value : std::string_view();
+    }
+
     static constexpr std::size_t kNoChannel = static_cast<std::size_t>(-1);
 
     // The index of the channel with that id. Tracks usually list channels in file order,
@@ -225,59 +229,60 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
 
     // --- Attributes ---
 
-    [[noreturn]] void Fail(const pugi::xml_node& node, std::string cause) const {
-        detail::FailLoad(detail::PlaceText(reader_.PlaceOf(node)), std::move(cause));
+    [[noreturn]] void Fail(const Element& element, std::string cause) const {
+        detail::FailLoad(detail::PlaceText(reader_.PlaceAt(element.at)), std::move(cause));
     }
-    [[noreturn]] void Fail(const pugi::xml_attribute& attribute, std::string cause) const {
-        detail::FailLoad(detail::PlaceText(reader_.PlaceOf(attribute)), std::move(cause));
+    [[noreturn]] void Fail(const Attribute& attribute, std::string cause) const {
+        detail::FailLoad(detail::PlaceText(reader_.PlaceAt(attribute.at)), std::move(cause));
     }
 
     // Counts what the sequence keeps for the element: however far a file's text expands, the
     // loader keeps no more than maxKeptBytes of it.
-    void Keep(std::size_t bytes, const pugi::xml_node& element) {
+    void Keep(std::size_t bytes, const Element& element) {
         kept_ += bytes;
         if (kept_ > maxKept_)
             FailKept(element);
     }
-    [[noreturn]] void FailKept(const pugi::xml_node& element) const;
+    [[noreturn]] void FailKept(const Element& element) const;
 
     // Marks a known attribute as read; a second one of the same name is refused.
-    void Once(unsigned& seen, unsigned bit, const pugi::xml_attribute& attribute,
-              const char* element) const {
+    void Once(unsigned& seen, unsigned bit, const Attribute& attribute, const char* element) const {
         if ((seen & bit) != 0)
             FailRepeated(attribute, element);
         seen |= bit;
     }
-    [[noreturn]] void FailRepeated(const pugi::xml_attribute& attribute, const char* element) const;
+    [[noreturn]] void FailRepeated(const Attribute& attribute, const char* element) const;
 
     // The attribute's whole number, which must lie in [min, max].
-    int64_t Whole(const pugi::xml_attribute& attribute, const char* element, int64_t min,
-                  int64_t max) const {
+    int64_t Whole(const Attribute& attribute, const char* element, int64_t min, int64_t max) const {
         int64_t value = 0;
-        if (!ReadWhole(attribute.value(), value) || value < min || value > max)
+        if (!ReadWhole(attribute.value, value) || value < min || value > max)
             FailNumber(attribute, element, min, max);
         return value;
     }
-    [[noreturn]] void FailNumber(const pugi::xml_attribute& attribute, const char* element,
-                                 int64_t min, int64_t max) const;
+    [[noreturn]] void FailNumber(const Attribute& attribute, const char* element, int64_t min,
+                                 int64_t max) const;
 
     // Digits, with a minus sign in front for a negative number; nothing else. Leading zeros
     // count for nothing; every range is within 32 bits, so a number of more than fifteen
     // digits after them is out of it and is not read on.
-    static bool ReadWhole(const char* text, int64_t& value) {
-        const bool negative = *text == '-';
-        const char* p = text + (negative ? 1 : 0);
+    static bool ReadWhole(std::string_view text, int64_t& value) {
+        const char* p = text.data();
+        const char* const end = p + text.size();
+        const bool negative = p != end && *p == '-';
+        p += negative ? 1 : 0;
         const char* const digits = p;
-        while (*p == '0')
+        while (p != end && *p == '0')
             ++p;
         const char* const significant = p;
         int64_t read = 0;
-        for (unsigned digit;
-             (digit = static_cast<unsigned char>(*p) - 0x30u) <= 9 && p - significant < 15; ++p) {
+        for (unsigned digit; p != end && (digit = static_cast<unsigned char>(*p) - 0x30u) <= 9 &&
+                             p - significant < 15;
+             ++p) {
             read = read * 10 + digit;
         }
         value = negative ? -read : read;
-        return *p == '\0' && p != digits;
+        return p == end && p != digits;
     }
 
     static constexpr int64_t kLongMax = std::numeric_limits<int32_t>::max();
@@ -285,10 +290,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     static constexpr int64_t kIntegerMax = std::numeric_limits<int16_t>::max();
     static constexpr int64_t kLevelMax = 100;
 
-    void ReadSequence(const pugi::xml_node& element) {
+    void ReadSequence(const Elements& elements, const Element& element) {
         unsigned seen = 0;
-        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
-            const char* name = a.name();
+        for (const Attribute& a : elements.AttributesOf(element)) {
+            const std::string_view name = a.name;
             if (Is(name, "formatVersion")) {
                 Once(seen, 1, a, "sequence");
                 sequence_.SetFormatVersion(static_cast<int32_t>(Whole(a, "sequence", 0, kLongMax)));
@@ -297,33 +302,33 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                 sequence_.SetLength(static_cast<int32_t>(Whole(a, "sequence", 0, kLongMax)));
             } else if (Is(name, "media")) {
                 Once(seen, 4, a, "sequence");
-                sequence_.SetMedia(a.value());
+                sequence_.SetMedia(std::string(a.value));
             } else if (Is(name, "shellCommand")) {
                 Once(seen, 8, a, "sequence");
-                sequence_.SetShellCommand(a.value());
+                sequence_.SetShellCommand(std::string(a.value));
             }
         }
     }
 
-    void BeginChannel(const pugi::xml_node& element) {
-        pugi::xml_attribute idAttribute;
+    void BeginChannel(const Elements& elements, const Element& element) {
+        const Attribute* idAttribute = nullptr;
         std::string name, subsequence;
         int64_t type = 0, deviceType = 0, network = 0, unit = 0, circuit = 0, circuits = 1;
         unsigned seen = 0;
-        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
-            const char* n = a.name();
+        for (const Attribute& a : elements.AttributesOf(element)) {
+            const std::string_view n = a.name;
             if (Is(n, "id")) {
                 Once(seen, 1, a, "channel");
-                idAttribute = a;
+                idAttribute = &a;
             } else if (Is(n, "name")) {
                 Once(seen, 2, a, "channel");
-                name = a.value();
+                name = a.value;
             } else if (Is(n, "type")) {
                 Once(seen, 4, a, "channel");
                 type = Whole(a, "channel", 0, kLongMax);
             } else if (Is(n, "subsequence")) {
                 Once(seen, 8, a, "channel");
-                subsequence = a.value();
+                subsequence = a.value;
             } else if (Is(n, "deviceType")) {
                 Once(seen, 16, a, "channel");
                 deviceType = Whole(a, "channel", 0, kLongMax);
@@ -341,14 +346,13 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                 circuits = Whole(a, "channel", 0, kIntegerMax);
             }
         }
-        if (!idAttribute || *idAttribute.value() == '\0')
+        if (idAttribute == nullptr || idAttribute->value.empty())
             Fail(element, "the <channel> has no id");
-        Keep(kChannelBytes + name.size() + subsequence.size() + std::strlen(idAttribute.value()),
-             element);
-        auto channel = std::make_shared<Channel>(idAttribute.value());
+        Keep(kChannelBytes + name.size() + subsequence.size() + idAttribute->value.size(), element);
+        auto channel = std::make_shared<Channel>(std::string(idAttribute->value));
         if (!indexById_.Insert(std::string_view(channel->Id()), sequence_.Channels().size())
                  .second) {
-            Fail(idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
+            Fail(*idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
         }
         channel->SetName(std::move(name));
         channel->SetChannelType(static_cast<int32_t>(type));
@@ -361,12 +365,12 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         sequence_.AddChannel(std::move(channel));
     }
 
-    void ReadEvent(const pugi::xml_node& element) {
+    void ReadEvent(const Elements& elements, const Element& element) {
         int64_t start = 0, end = 0, intensity = 0, from = 0, to = 0;
         bool hasIntensity = false;
         unsigned seen = 0;
-        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
-            const char* n = a.name();
+        for (const Attribute& a : elements.AttributesOf(element)) {
+            const std::string_view n = a.name;
             switch (n[0]) {
                 case 's':
                     if (Is(n, "start")) {
@@ -410,16 +414,16 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         }
     }
 
-    void BeginTrack(const pugi::xml_node& element) {
+    void BeginTrack(const Elements& elements, const Element& element) {
         Keep(kTrackBytes, element);
         auto track = std::make_shared<Track>();
         track->SetLength(sequence_.Length());
         unsigned seen = 0;
-        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
-            const char* n = a.name();
+        for (const Attribute& a : elements.AttributesOf(element)) {
+            const std::string_view n = a.name;
             if (Is(n, "name")) {
                 Once(seen, 1, a, "track");
-                track->SetName(a.value());
+                track->SetName(std::string(a.value));
             } else if (Is(n, "length")) {
                 Once(seen, 2, a, "track");
                 track->SetLength(static_cast<int32_t>(Whole(a, "track", 0, kLongMax)));
@@ -430,9 +434,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         sequence_.AddTrack(std::move(track));
     }
 
-    void ReadChannelRef(const pugi::xml_node& element) {
-        const pugi::xml_attribute idAttribute = element.attribute("id");
-        const std::string_view id = idAttribute.value();
+    void ReadChannelRef(const Elements& elements, const Element& element) {
+        const std::string_view id = ValueOf(elements, element, "id");
         Keep(sizeof(std::shared_ptr<Channel>), element);
         if (const std::size_t index = FindChannel(id); index != kNoChannel) {
             track_->AddChannel(sequence_.Channels()[index]);
@@ -441,12 +444,12 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         // Perhaps a channel further on: resolved when the file is read.
         Keep(sizeof(PendingReference) + id.size(), element);
         pending_.push_back(
-            {track_, track_->channels_.size(), std::string(id), reader_.PlaceOf(element)});
+            {track_, track_->channels_.size(), std::string(id), reader_.PlaceAt(element.at)});
         track_->channels_.push_back(nullptr);
     }
 
-    bool BeginIntensityFile(const pugi::xml_node& element) {
-        const std::string_view kind = element.attribute("kind").value();
+    bool BeginIntensityFile(const Elements& elements, const Element& element) {
+        const std::string_view kind = ValueOf(elements, element, "kind");
         IntensityFileKind fileKind;
         if (kind == "Gridcraft") {
             fileKind = IntensityFileKind::Gridcraft;
@@ -460,17 +463,18 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                               " intensity file (a sequence has at most one of each kind)");
         }
         Keep(kIntensityFileBytes, element);
-        auto file = std::make_shared<IntensityFile>(fileKind, element.attribute("name").value());
+        auto file = std::make_shared<IntensityFile>(
+            fileKind, std::string(ValueOf(elements, element, "name")));
         intensityFile_ = file.get();
         sequence_.SetIntensityFile(std::move(file), trackIndex_);
         return true;
     }
 
-    void ReadDevice(const pugi::xml_node& element) {
+    void ReadDevice(const Elements& elements, const Element& element) {
         int64_t deviceType = 0, network = 0, unit = 0, start = 0, count = 1;
         unsigned seen = 0;
-        for (pugi::xml_attribute a = element.first_attribute(); a; a = a.next_attribute()) {
-            const char* n = a.name();
+        for (const Attribute& a : elements.AttributesOf(element)) {
+            const std::string_view n = a.name;
             if (Is(n, "deviceType")) {
                 Once(seen, 1, a, "device");
                 deviceType = Whole(a, "device", 0, kLongMax);
@@ -516,24 +520,24 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     static constexpr std::size_t kIntensityFileBytes = sizeof(IntensityFile) + 32;
 };
 
-void SequenceBuilder::FailKept(const pugi::xml_node& element) const {
+void SequenceBuilder::FailKept(const Element& element) const {
     Fail(element,
          "the sequence holds more channels, tracks and intensity-file devices than fit "
          "in " +
              detail::ByteCountText(maxKept_));
 }
 
-void SequenceBuilder::FailRepeated(const pugi::xml_attribute& attribute,
-                                   const char* element) const {
+void SequenceBuilder::FailRepeated(const Attribute& attribute, const char* element) const {
     Fail(attribute,
-         std::string("the attribute ") + attribute.name() + " of <" + element + "> is repeated");
+         "the attribute " + std::string(attribute.name) + " of <" + element + "> is repeated");
 }
 
-void SequenceBuilder::FailNumber(const pugi::xml_attribute& attribute, const char* element,
-                                 int64_t min, int64_t max) const {
-    Fail(attribute, std::string("the attribute ") + attribute.name() + "=\"" + attribute.value() +
-                        "\" of <" + element + "> is not a whole number from " +
-                        std::to_string(min) + " to " + std::to_string(max));
+void SequenceBuilder::FailNumber(const Attribute& attribute, const char* element, int64_t min,
+                                 int64_t max) const {
+    Fail(attribute, "the attribute " + std::string(attribute.name) + "=\"" +
+                        std::string(attribute.value) + "\" of <" + element +
+                        "> is not a whole number from " + std::to_string(min) + " to " +
+                        std::to_string(max));
 }
 
 namespace {
@@ -569,6 +573,7 @@ bool Sequence::Load(const std::string& fileName, const ProgressCallback& progres
         detail::XmlPieceReader::Options readerOptions;
         readerOptions.pieceBytes = options.pieceBytes;
         readerOptions.maxDepth = options.maxDepth;
+        readerOptions.plainMarkup = options.plainMarkup;
         readerOptions.tick = [&clock] { clock.Tick(); };
         detail::XmlPieceReader reader(*source, std::move(readerOptions));
         SequenceBuilder builder(loaded, reader, options.maxKeptBytes);

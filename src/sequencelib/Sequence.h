@@ -41,6 +41,9 @@ struct LoadOptions {
     // A sequence that would keep more than this is refused as it is read, however small its
     // file (compressed text of a few megabytes can hold hundreds of millions of elements).
     std::uint64_t maxKeptBytes = kMaxKeptBytes;
+    // Plainly written markup is read in one pass of its own; off, pugixml reads every piece
+    // (the same sequence, the same errors, more slowly).
+    bool plainMarkup = true;
     // Asked as the load goes, after each percent told and at least once per pollInterval
     // of work in between (the loading thread's processor time): false stops the load.
     std::function<bool()> keepGoing;

@@ -27,6 +27,9 @@ std::size_t DescendBytes(const XmlPieceReader::Options& options) {
     return std::max<std::size_t>(PieceBytes(options) / 32, 1);
 }
 
+// What the plain way reads beyond a piece: the last node of a piece may end past it.
+constexpr int64_t kPlainMarginBytes = int64_t{64} << 10;
+
 }  // namespace
 
 XmlPieceReader::XmlPieceReader(ByteSource& source, Options options)
@@ -87,7 +90,7 @@ void XmlPieceReader::CheckPrologItem(int64_t at, const Lexed& item) {
         }
         return;
     }
-    parser_.ParseNodes(at, item.end);
+    parser_.ParseNodes(at, item.end, elements_);
 }
 
 void XmlPieceReader::ReadProlog(XmlPieceHandler& handler) {
@@ -137,9 +140,9 @@ void XmlPieceReader::ReadProlog(XmlPieceHandler& handler) {
 void XmlPieceReader::EnterRoot(XmlPieceHandler& handler, int64_t at, const Lexed& tag) {
     const std::string_view name = lexer_.NameAt(at + 1);
     const bool empty = tag.kind == Markup::EmptyTag;
-    const pugi::xml_node root = parser_.ParseStartTag(at, tag.end, empty, name);
+    parser_.ParseStartTag(at, tag.end, empty, name, elements_);
     open_.Push(name, at);
-    handler.EnterElement(root);
+    handler.EnterElement(elements_);
     pos_ = tag.end;
     if (empty) {
         handler.LeaveElement();
@@ -181,25 +184,63 @@ void XmlPieceReader::HandNodes(XmlPieceHandler& handler, int64_t from, int64_t t
         }
         return;
     }
-    const pugi::xml_document& nodes = parser_.ParseNodes(from, to);
-    for (pugi::xml_node node = nodes.first_child(); node; node = node.next_sibling()) {
-        switch (node.type()) {
-            case pugi::node_element:
-                handler.CompleteElement(node);
-                break;
-            case pugi::node_declaration:
-                parser_.Fail(node,
-                             "an XML declaration is allowed only at the start of the document");
-            case pugi::node_doctype:
-                parser_.Fail(node, "a DOCTYPE is allowed only before the root element");
-            default:
-                break;
-        }
+    if (options_.plainMarkup && plain_.Scan(text, from, elements_)) {
+        if (!elements_.Empty())
+            handler.CompleteElements(elements_);
+        return;
     }
+    const pugi::xml_node misplaced = parser_.ParseNodes(from, to, elements_);
+    if (!elements_.Empty())
+        handler.CompleteElements(elements_);
+    if (misplaced.type() == pugi::node_declaration)
+        parser_.Fail(misplaced, "an XML declaration is allowed only at the start of the document");
+    if (misplaced.type() == pugi::node_doctype)
+        parser_.Fail(misplaced, "a DOCTYPE is allowed only before the root element");
+}
+
+bool XmlPieceReader::PlainStep(XmlPieceHandler& handler) {
+    // Where the plain way gave up, the general way reads at least a piece before it is tried
+    // again: what the cut finder has read ahead is then forgotten only once a piece, and
+    // every byte is still read a bounded number of times.
+    if (!options_.plainMarkup || pos_ < plainFrom_)
+        return false;
+    const auto pieceBytes = static_cast<int64_t>(PieceBytes(options_));
+    window_.FillTo(pos_ + pieceBytes + kPlainMarginBytes);
+    PlainMarkup::Rules rules;
+    rules.limit = pos_ + pieceBytes;
+    rules.descendBytes = static_cast<int64_t>(DescendBytes(options_));
+    rules.depthLeft = options_.maxDepth - static_cast<int64_t>(open_.Depth());
+    int64_t scanned = pos_;
+    const PlainMarkup::Cut cut =
+        plain_.ScanContent(window_.View(pos_, window_.End()), pos_, rules, elements_, scanned);
+    switch (cut.kind) {
+        case PlainMarkup::Cut::Kind::NotPlain:
+            plainFrom_ = std::max(scanned, pos_ + pieceBytes);
+            return false;
+        case PlainMarkup::Cut::Kind::Piece:
+            if (!elements_.Empty())
+                handler.CompleteElements(elements_);
+            pos_ = cut.at;
+            break;
+        case PlainMarkup::Cut::Kind::EndTag:
+            if (!elements_.Empty())
+                handler.CompleteElements(elements_);
+            open_.CheckEndTag(window_.View(cut.at, cut.tagEnd), cut.at);
+            handler.LeaveElement();
+            open_.Pop();
+            pos_ = cut.tagEnd;
+            break;
+    }
+    // The cut finder's next cut depends only on the text from here on: it starts afresh.
+    plainFrom_ = std::max(plainFrom_, scanned);
+    cuts_.Start(pos_);
+    return true;
 }
 
 void XmlPieceReader::Step(XmlPieceHandler& handler) {
     Release();
+    if (PlainStep(handler))
+        return;
     const CutFinder::Cut cut = cuts_.Next(pos_, open_.Depth());
     switch (cut.kind) {
         case CutFinder::CutKind::Piece:
@@ -216,9 +257,9 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
             break;
         case CutFinder::CutKind::Descend: {
             const std::string_view name = lexer_.NameAt(cut.at + 1);
-            const pugi::xml_node element = parser_.ParseStartTag(cut.at, cut.tag.end, false, name);
+            parser_.ParseStartTag(cut.at, cut.tag.end, false, name, elements_);
             open_.Push(name, cut.at);
-            handler.EnterElement(element);
+            handler.EnterElement(elements_);
             pos_ = cut.tag.end;
             break;
         }

@@ -11,8 +11,10 @@
 #include "sequencelib/MarkupLexer.h"
 #include "sequencelib/OpenElements.h"
 #include "sequencelib/PieceParser.h"
+#include "sequencelib/PlainMarkup.h"
 #include "sequencelib/TextPlaces.h"
 #include "sequencelib/TextWindow.h"
+#include "sequencelib/XmlElements.h"
 
 namespace vtr::seqlib::detail {
 
@@ -20,11 +22,12 @@ namespace vtr::seqlib::detail {
 class XmlPieceHandler {
   public:
     virtual ~XmlPieceHandler() = default;
-    // The document element, or an element too large for one piece: its start tag (the
-    // node has its attributes and no children). Its content follows, then LeaveElement.
-    virtual void EnterElement(const pugi::xml_node& startTag) = 0;
-    // A whole element, child of the innermost element entered.
-    virtual void CompleteElement(const pugi::xml_node& element) = 0;
+    // The document element, or an element too large for one piece: its start tag alone
+    // (tag[0], with its attributes). Its content follows, then LeaveElement.
+    virtual void EnterElement(const XmlElements& tag) = 0;
+    // Whole elements, children of the innermost element entered: elements[0], then the one
+    // at elements[0].end, and so on, each followed by its descendants.
+    virtual void CompleteElements(const XmlElements& elements) = 0;
     virtual void LeaveElement() = 0;
 };
 
@@ -37,7 +40,8 @@ class XmlPieceHandler {
 //   MarkupLexer   where each tag, comment or other markup item ends
 //   CutFinder     where the content of the innermost open element is cut: between whole
 //                 nodes, or at a start tag that is entered, or at its end tag
-//   PieceParser   pugixml over one piece, or one start tag
+//   PlainMarkup   one piece written plainly, as sequence files are, read in one pass
+//   PieceParser   pugixml over any other piece, and over each start tag entered
 //   OpenElements  the elements entered, each end tag checked against its start tag
 //
 // The reader itself checks what stands around the document element: nothing but blanks,
@@ -53,6 +57,9 @@ class XmlPieceReader {
         int32_t maxDepth = 100000;
         // Called after each read from the source and each piece (the load's clock).
         std::function<void()> tick;
+        // Pieces of plain markup are read without pugixml (off: pugixml reads them all,
+        // to compare).
+        bool plainMarkup = true;
     };
 
     XmlPieceReader(ByteSource& source, Options options);
@@ -62,12 +69,9 @@ class XmlPieceReader {
     // Reads the document to its end. afterStep is called after each piece.
     void Run(XmlPieceHandler& handler, const std::function<void()>& afterStep);
 
-    // Where a node or attribute handed to the handler stands (valid while the handler
-    // runs).
-    TextPlace PlaceOf(const pugi::xml_node& node) const { return parser_.PlaceOf(node); }
-    TextPlace PlaceOf(const pugi::xml_attribute& attribute) const {
-        return parser_.PlaceOf(attribute);
-    }
+    // Where the text offset of an element or attribute handed to the handler stands (valid
+    // while the handler runs).
+    TextPlace PlaceAt(int64_t offset) const { return lines_.PlaceAt(offset); }
 
     // The most text the reader has held at once, in bytes.
     std::size_t BufferBytes() const { return window_.Capacity(); }
@@ -80,6 +84,9 @@ class XmlPieceReader {
     void EnterRoot(XmlPieceHandler& handler, int64_t at, const Lexed& tag);
     void Step(XmlPieceHandler& handler);
     void ReadEpilog();
+    // One step the plain way, when the content from pos_ on is plain markup; false to take
+    // it the general way.
+    bool PlainStep(XmlPieceHandler& handler);
     void HandNodes(XmlPieceHandler& handler, int64_t from, int64_t to);
     void CheckPrologItem(int64_t at, const Lexed& item);
     // Forgets the text before pos_.
@@ -91,10 +98,13 @@ class XmlPieceReader {
     TextWindow window_;
     LineCounter lines_;
     MarkupLexer lexer_;
+    PlainMarkup plain_;
     PieceParser parser_;
+    XmlElements elements_;
     OpenElements open_;
     CutFinder cuts_;
-    int64_t pos_ = 0;  // the first byte not yet handed over
+    int64_t pos_ = 0;        // the first byte not yet handed over
+    int64_t plainFrom_ = 0;  // where the plain way may be tried again
 };
 
 }  // namespace vtr::seqlib::detail

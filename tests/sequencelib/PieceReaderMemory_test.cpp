@@ -61,8 +61,11 @@ class MadeText final : public ByteSource {
 
 class CountingHandler final : public XmlPieceHandler {
   public:
-    void EnterElement(const pugi::xml_node&) override { ++entered; }
-    void CompleteElement(const pugi::xml_node&) override { ++completed; }
+    void EnterElement(const XmlElements&) override { ++entered; }
+    void CompleteElements(const XmlElements& elements) override {
+        for (uint32_t i = 0; i < elements.Size(); i = elements[i].end)
+            ++completed;
+    }
     void LeaveElement() override { ++left; }
     int entered = 0, completed = 0, left = 0;
 };

@@ -42,9 +42,10 @@ std::string Summary(const Sequence& s) {
 }
 
 // The summary of a load, or its error (without the file name).
-std::string Outcome(const std::string& path, std::size_t pieceBytes) {
+std::string Outcome(const std::string& path, std::size_t pieceBytes, bool plainMarkup = true) {
     LoadOptions options;
     options.pieceBytes = pieceBytes;
+    options.plainMarkup = plainMarkup;
     Sequence s;
     try {
         s.Load(path, {}, options);
@@ -148,6 +149,81 @@ TEST(XmlPieceReader, DamagedDocumentsAreJudgedAlikeWhateverThePieces) {
         }
     }
     EXPECT_GT(refused, 100) << "the damage should break many documents";
+}
+
+// A sequence written plainly, as the suite writes them, with the liberties markup allows:
+// blanks around "=" and before "/>" and ">", single quotes, the other quote inside a value,
+// line breaks and tabs between attributes, names with '-', '.', ':' and digits, elements
+// the loader does not know, text between elements.
+const char* const kPlain = R"(<?xml version="1.0" encoding="UTF-8"?>
+<sequence formatVersion="1" length="4000" media='song "live".mp3'>
+  <channels>
+    <channel id="1" name="Arch left" deviceType="1" network="0" unit="1" circuit="1">
+      <event start="0" end="2000" intensity="40"/>
+      <event start = "2000"	end='4000' intensity="0" />
+    </channel>
+    <channel id="2" name='Tree' deviceType="3"
+             network="2" circuit="17" circuits="3"><event start="10" end="20" from="0" to="100"></event></channel>
+    <channel id="sub-1.x" type="6" subsequence="Sub.las" x:note="a > b"/>
+    <my-data.v2 a1="1"><nested><channel id="not-one"/></nested> loose text </my-data.v2>
+    <channel id="4" name="Star" deviceType="1" unit="255" circuit="32767"><event start="-5" end="1" intensity="100"/></channel >
+  </channels>
+  <tracks>
+    <track name="Main" length="3000"><channelRef id="1"/><channelRef id="sub-1.x"/><channelRef id="4"/>
+      <intensityFile kind="Gridcraft" name="g.gci"><device deviceType="7" network="2" start="10" count="3"/></intensityFile>
+    </track>
+    <track name="Second"><channelRef id="2"/><channelRef id="1"/></track>
+  </tracks>
+</sequence>
+)";
+
+// Plain markup is read in a pass of its own, and anything else by pugixml: both ways must
+// read every document alike and refuse every other one with the same message and place,
+// whatever the pieces. The damage makes text that is plain and well-formed, plain and
+// broken, or not plain at all, in every part of a tag.
+TEST(XmlPieceReader, PlainMarkupIsReadAsPugixmlReadsIt) {
+    TempFolder folder;
+    for (const char* original : {kPlain, kTricky}) {
+        const std::string path = folder.Write("plain.lms", original);
+        for (const std::size_t piece : {std::size_t{16}, std::size_t{97}, std::size_t{1} << 20})
+            EXPECT_EQ(Outcome(path, piece, true), Outcome(path, piece, false)) << piece;
+    }
+    const std::string plainWhole = Outcome(folder.Write("plain.lms", kPlain), std::size_t{1} << 20);
+    EXPECT_NE(plainWhole.find("sub-1.x,,,1,6,Sub.las,off"), std::string::npos) << plainWhole;
+    EXPECT_EQ(plainWhole.find("not-one"), std::string::npos) << plainWhole;
+
+    std::mt19937 random(20261124);
+    std::string bytes = "<>/\"'=&;#x :-.1a\t\n\r\x80\x1f";
+    bytes += '\0';
+    int refused = 0;
+    const std::string original = kPlain;
+    for (int round = 0; round < 700; ++round) {
+        std::string text = original;
+        for (int damage = 0; damage <= round % 2; ++damage) {
+            const std::size_t at = random() % text.size();
+            const char byte = bytes[random() % bytes.size()];
+            switch (random() % 3) {
+                case 0:
+                    text.erase(at, 1);
+                    break;
+                case 1:
+                    text.insert(at, 1, byte);
+                    break;
+                default:
+                    text[at] = byte;
+                    break;
+            }
+        }
+        const std::string path = folder.Write("damaged.lms", text);
+        for (const std::size_t piece : {std::size_t{16}, std::size_t{61}, std::size_t{1} << 20}) {
+            const std::string plain = Outcome(path, piece, true);
+            EXPECT_EQ(plain, Outcome(path, piece, false))
+                << "round " << round << ", pieces of " << piece << "\n"
+                << text;
+            refused += plain.rfind("error", 0) == 0;
+        }
+    }
+    EXPECT_GT(refused, 300) << "the damage should break many documents";
 }
 
 // Elements the loader does not know, nested `depth` deep between two channels; inside them a
