@@ -105,6 +105,41 @@ inline const char* FindValueStop(const char* p, const char* end) {
     return p;
 }
 
+// The first byte in [p, end) that cannot go on in a plain name (ASCII letters, digits, '_',
+// '-', '.' and ':'); end when there is none.
+inline bool IsPlainNameByte(char c) {
+    const auto u = static_cast<unsigned char>(c);
+    return static_cast<unsigned char>((u | 0x20u) - 'a') <= 25 ||
+           static_cast<unsigned char>(u - '0') <= 9 || c == '_' || c == '-' || c == '.' || c == ':';
+}
+inline const char* FindNameEnd(const char* p, const char* end) {
+#ifdef VTR_SCAN_SSE2
+    const __m128i caseBit = _mm_set1_epi8(0x20);
+    const __m128i a = _mm_set1_epi8('a');
+    const __m128i z = _mm_set1_epi8(25);
+    const __m128i zero = _mm_set1_epi8('0');
+    const __m128i nine = _mm_set1_epi8(9);
+    for (; end - p >= 16; p += 16) {
+        const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+        const __m128i letter = _mm_sub_epi8(_mm_or_si128(v, caseBit), a);
+        const __m128i digit = _mm_sub_epi8(v, zero);
+        const __m128i named =
+            _mm_or_si128(_mm_or_si128(_mm_cmpeq_epi8(_mm_min_epu8(letter, z), letter),
+                                      _mm_cmpeq_epi8(_mm_min_epu8(digit, nine), digit)),
+                         _mm_or_si128(_mm_or_si128(_mm_cmpeq_epi8(v, _mm_set1_epi8('_')),
+                                                   _mm_cmpeq_epi8(v, _mm_set1_epi8('-'))),
+                                      _mm_or_si128(_mm_cmpeq_epi8(v, _mm_set1_epi8('.')),
+                                                   _mm_cmpeq_epi8(v, _mm_set1_epi8(':')))));
+        const auto others = static_cast<unsigned>(_mm_movemask_epi8(named)) ^ 0xFFFFu;
+        if (others != 0)
+            return p + std::countr_zero(others);
+    }
+#endif
+    while (p < end && IsPlainNameByte(*p))
+        ++p;
+    return p;
+}
+
 // The first `c` in [p, end); end when there is none. Long runs go to memchr.
 inline const char* FindByte(const char* p, const char* end, char c) {
     const char* const near = end - p > 64 ? p + 64 : end;

@@ -11,9 +11,8 @@ namespace vtr::seqlib::detail {
 namespace {
 
 enum : uint8_t {
-    kNameStart = 1,  // may start a name
-    kName = 2,       // may go on in a name
-    kSpace = 4,      // a blank between markup
+    kNameStart = 1,  // may start a name (FindNameEnd finds where it ends)
+    kSpace = 2,      // a blank between markup
 };
 
 constexpr std::array<uint8_t, 256> MakeClasses() {
@@ -22,9 +21,7 @@ constexpr std::array<uint8_t, 256> MakeClasses() {
         uint8_t k = 0;
         const bool letter = (c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z');
         if (letter || c == '_' || c == ':')
-            k |= kNameStart | kName;
-        if ((c >= '0' && c <= '9') || c == '-' || c == '.')
-            k |= kName;
+            k |= kNameStart;
         if (c == ' ' || c == '\t' || c == '\r' || c == '\n')
             k |= kSpace;
         classes[static_cast<std::size_t>(c)] = k;
@@ -46,11 +43,8 @@ inline void SkipSpace(const char*& p, const char* end) {
 // A name from p on, p moved past it; empty when p does not start one.
 inline std::string_view Name(const char*& p, const char* end) {
     const char* const first = p;
-    if (p < end && Is(*p, kNameStart)) {
-        ++p;
-        while (p < end && Is(*p, kName))
-            ++p;
-    }
+    if (p < end && Is(*p, kNameStart))
+        p = FindNameEnd(p + 1, end);
     return {first, static_cast<std::size_t>(p - first)};
 }
 
@@ -74,58 +68,66 @@ inline bool EndTag(const char*& p, const char* end, std::string_view name) {
 
 }  // namespace
 
-PlainMarkup::Read PlainMarkup::Element(const char*& p, const char* stop, int64_t depthLeft,
+PlainMarkup::Read PlainMarkup::Element(const char*& where, const char* stop, int64_t depthLeft,
                                        XmlElements& out) {
     const auto offsetOf = [this](const char* q) { return offset_ + (q - begin_); };
     const char* const end = end_;
+    // Read through a local pointer, which the compiler keeps in a register.
+    const char* p = where;
+    const auto finish = [&](Read read) {
+        where = p;
+        return read;
+    };
     open_.clear();
     for (;;) {
         // p is at a '<' inside the element (or at its start tag).
         if (p >= stop)
-            return Read::TooFar;
+            return finish(Read::TooFar);
         if (end - p < 2)
-            return Read::NotPlain;
+            return finish(Read::NotPlain);
         if (p[1] == '/') {
             if (open_.empty() || !EndTag(p, end, out[open_.back()].name))
-                return Read::NotPlain;
+                return finish(Read::NotPlain);
             out.Close(open_.back());
             open_.pop_back();
         } else {
             const char* const tag = p++;
             const std::string_view name = Name(p, end);
             if (name.empty() || static_cast<int64_t>(open_.size()) >= depthLeft)
-                return Read::NotPlain;
+                return finish(Read::NotPlain);
             const uint32_t element = out.Open(name, offsetOf(tag));
             for (;;) {
                 const char* const blank = p;
                 SkipSpace(p, end);
                 if (p == end)
-                    return Read::NotPlain;
+                    return finish(Read::NotPlain);
                 if (*p == '>') {
                     ++p;
+                    if (open_.empty())
+                        startTagEnd_ = offsetOf(p);
                     open_.push_back(element);
                     break;
                 }
                 if (*p == '/') {
                     if (end - p < 2 || p[1] != '>')
-                        return Read::NotPlain;
+                        return finish(Read::NotPlain);
                     p += 2;
                     out.Close(element);
                     break;
                 }
                 if (p == blank)
-                    return Read::NotPlain;  // attributes are set apart by blanks
+                    return finish(Read::NotPlain);  // attributes are set apart by blanks
                 const char* const attributeAt = p;
                 const std::string_view attributeName = Name(p, end);
                 if (attributeName.empty())
-                    return Read::NotPlain;
+                    return finish(Read::NotPlain);
                 SkipSpace(p, end);
                 if (p == end || *p != '=')
-                    return Read::NotPlain;
+                    return finish(Read::NotPlain);
                 ++p;
                 SkipSpace(p, end);
                 if (p == end || (*p != '"' && *p != '\''))
-                    return Read::NotPlain;
+                    return finish(Read::NotPlain);
                 const char quote = *p++;
                 const char* const value = p;
                 for (;;) {
@@ -135,7 +137,7 @@ PlainMarkup::Read PlainMarkup::Element(const char*& p, const char* stop, int64_t
                     ++p;  // the other quote
                 }
                 if (p == end || *p != quote)
-                    return Read::NotPlain;
+                    return finish(Read::NotPlain);
                 out.AddAttribute(attributeName,
                                  std::string_view(value, static_cast<std::size_t>(p - value)),
                                  offsetOf(attributeAt));
@@ -143,9 +145,9 @@ PlainMarkup::Read PlainMarkup::Element(const char*& p, const char* stop, int64_t
             }
         }
         if (open_.empty())
-            return Read::Whole;
+            return finish(Read::Whole);
         if (!Text(p, end) || p == end)
-            return Read::NotPlain;
+            return finish(Read::NotPlain);
     }
 }
 
@@ -207,13 +209,16 @@ PlainMarkup::Cut PlainMarkup::ScanContent(std::string_view text, int64_t offset,
                 boundary = p;
                 break;
             case Read::TooFar:
-                // An element that does not end soon enough is entered, which the cut finder
-                // does; what comes before it is a piece.
-                if (boundary == begin_)
-                    return notPlain();
-                out.Truncate(elements, attributes);
+                // An element that does not end soon enough is entered; what comes before it
+                // is a piece of its own.
                 scanned = at(p);
-                return {Cut::Kind::Piece, at(boundary), 0};
+                if (boundary != begin_) {
+                    out.Truncate(elements, attributes);
+                    return {Cut::Kind::Piece, at(boundary), 0};
+                }
+                out.Truncate(1, out[0].attributeCount);
+                out.Close(0);
+                return {Cut::Kind::Descend, at(boundary), startTagEnd_};
             case Read::NotPlain:
                 return notPlain();
         }

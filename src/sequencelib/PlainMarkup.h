@@ -30,30 +30,32 @@ class PlainMarkup {
         int64_t depthLeft = 0;     // how much deeper than the open element may nest
     };
     struct Cut {
-        enum class Kind { NotPlain, Piece, EndTag } kind = Kind::NotPlain;
-        int64_t at = 0;      // the end of the piece, or where the end tag starts
-        int64_t tagEnd = 0;  // one past the end tag
+        enum class Kind { NotPlain, Piece, EndTag, Descend } kind = Kind::NotPlain;
+        int64_t at = 0;      // the end of the piece, or where the end or start tag starts
+        int64_t tagEnd = 0;  // one past the end or start tag
     };
 
     // The cut the cut finder would make next in the content that starts at `offset`, the
     // first byte of `text` (which holds at least up to the limit, unless the text ends
-    // first), when the content up to it is plain markup; its whole elements into `out`.
-    // NotPlain otherwise. When the scan gave up on an element (entered, or not plain),
+    // first), when the content up to it is plain markup: its whole elements into `out`, or
+    // for Descend the element entered, with its attributes and no children.
+    // NotPlain otherwise. When the scan gave up on an element (to enter it, or not plain),
     // `scanned` is the text offset where it did, else it is left as it was.
     Cut ScanContent(std::string_view text, int64_t offset, const Rules& rules, XmlElements& out,
                     int64_t& scanned);
 
   private:
     enum class Read { Whole, TooFar, NotPlain };
-    // Reads the element whose '<' is at p, with its content, and moves p past it. TooFar
+    // Reads the element whose '<' is at `where`, with its content, and moves past it. TooFar
     // when a '<' of it stands at or after `stop` (before anything that is not plain);
     // NotPlain when it is not plain markup, nests deeper than depthLeft, or the text ends
     // inside it.
-    Read Element(const char*& p, const char* stop, int64_t depthLeft, XmlElements& out);
+    Read Element(const char*& where, const char* stop, int64_t depthLeft, XmlElements& out);
 
     const char* begin_ = nullptr;
     const char* end_ = nullptr;
     int64_t offset_ = 0;
+    int64_t startTagEnd_ = 0;     // one past the start tag of the last element read
     std::vector<uint32_t> open_;  // the elements entered, innermost last
 };
 

@@ -220,8 +220,25 @@ bool XmlPieceReader::PlainStep(XmlPieceHandler& handler) {
         case PlainMarkup::Cut::Kind::Piece:
             if (!elements_.Empty())
                 handler.CompleteElements(elements_);
+            // An element too large for the piece ends it, and is read again to be entered.
+            readTwice_ += std::max<int64_t>(scanned - cut.at, 0);
             pos_ = cut.at;
             break;
+        case PlainMarkup::Cut::Kind::Descend: {
+            // The element's content up to `scanned` is read again from its start tag: only
+            // while what is read twice stays within what has been read, so that deep nesting
+            // of large elements cannot make it read the same bytes over and over.
+            const int64_t again = scanned - cut.tagEnd;
+            if (readTwice_ + again > pos_ + pieceBytes) {
+                plainFrom_ = std::max(scanned, pos_ + pieceBytes);
+                return false;
+            }
+            readTwice_ += again;
+            open_.Push(elements_[0].name, cut.at);
+            handler.EnterElement(elements_);
+            pos_ = cut.tagEnd;
+            break;
+        }
         case PlainMarkup::Cut::Kind::EndTag:
             if (!elements_.Empty())
                 handler.CompleteElements(elements_);
@@ -232,7 +249,6 @@ bool XmlPieceReader::PlainStep(XmlPieceHandler& handler) {
             break;
     }
     // The cut finder's next cut depends only on the text from here on: it starts afresh.
-    plainFrom_ = std::max(plainFrom_, scanned);
     cuts_.Start(pos_);
     return true;
 }

@@ -105,6 +105,7 @@ class XmlPieceReader {
     CutFinder cuts_;
     int64_t pos_ = 0;        // the first byte not yet handed over
     int64_t plainFrom_ = 0;  // where the plain way may be tried again
+    int64_t readTwice_ = 0;  // bytes the plain way has read again after entering an element
 };
 
 }  // namespace vtr::seqlib::detail
