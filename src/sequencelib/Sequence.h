@@ -32,8 +32,10 @@ inline constexpr std::uint64_t kMaxKeptBytes = std::uint64_t{1} << 30;
 // may run on different threads at once, each calling back on its own thread.
 struct LoadOptions {
     // How much of the file is parsed at a time. The loader never holds the parse tree of
-    // more than about this much text, whatever the file's size.
-    std::size_t pieceBytes = std::size_t{1} << 20;
+    // more than about this much text, whatever the file's size. A quarter of a megabyte
+    // keeps the text and its elements in the processor's cache as they are read, which
+    // makes a load both smaller and faster than with larger pieces.
+    std::size_t pieceBytes = std::size_t{256} << 10;
     // Decompressed data beyond this is refused.
     std::uint64_t maxExpandedBytes = kMaxExpandedBytes;
     // Elements nested deeper than this are refused.
