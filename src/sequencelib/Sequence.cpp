@@ -10,7 +10,6 @@
 
 #include "engine/VtrError.h"
 #include "sequencelib/ByteSource.h"
-#include "sequencelib/FlatMap.h"
 #include "sequencelib/LoadClock.h"
 #include "sequencelib/LoadFailure.h"
 #include "sequencelib/XmlPieceReader.h"
@@ -51,18 +50,81 @@ namespace {
 
 // Channel ids are usually the numbers 1, 2, 3...: hashed as their value, they fill the
 // table in order, which keeps a large file's index in the cache. Other ids hash as text.
-struct ChannelIdHash {
-    std::size_t operator()(std::string_view id) const noexcept {
-        if (id.empty() || id.size() > 18)
+std::size_t ChannelIdHash(std::string_view id) noexcept {
+    if (id.empty() || id.size() > 18)
+        return std::hash<std::string_view>{}(id);
+    std::size_t value = 0;
+    for (const char c : id) {
+        if (c < '0' || c > '9')
             return std::hash<std::string_view>{}(id);
-        std::size_t value = 0;
-        for (const char c : id) {
-            if (c < '0' || c > '9')
-                return std::hash<std::string_view>{}(id);
-            value = value * 10 + static_cast<std::size_t>(c - '0');
-        }
-        return value;
+        value = value * 10 + static_cast<std::size_t>(c - '0');
     }
+    return value;
+}
+
+// Each channel's index in the sequence, by id: open addressing (linear probing) over eight
+// bytes a channel, its id's hash and its index, the id itself compared in the channel. The
+// table doubles when half full, moving hashes without reading an id again.
+class ChannelIdIndex {
+  public:
+    static constexpr std::size_t kNone = static_cast<std::size_t>(-1);
+
+    explicit ChannelIdIndex(const std::vector<std::shared_ptr<Channel>>& channels)
+        : channels_(channels), slots_(64) {}
+
+    // Adds the channel at `index` under its id; false when a channel has that id already.
+    bool Insert(std::size_t index) {
+        if ((size_ + 1) * 2 > slots_.size())
+            Grow();
+        const std::string_view id = channels_[index]->Id();
+        const auto hash = static_cast<uint32_t>(ChannelIdHash(id));
+        Slot& slot = SlotOf(id, hash);
+        if (slot.index != kEmpty)
+            return false;
+        slot = {hash, static_cast<uint32_t>(index)};
+        ++size_;
+        return true;
+    }
+
+    std::size_t Find(std::string_view id) const {
+        const Slot& slot =
+            const_cast<ChannelIdIndex*>(this)->SlotOf(id, static_cast<uint32_t>(ChannelIdHash(id)));
+        return slot.index == kEmpty ? kNone : slot.index;
+    }
+
+  private:
+    static constexpr uint32_t kEmpty = UINT32_MAX;
+    struct Slot {
+        uint32_t hash = 0;
+        uint32_t index = kEmpty;
+    };
+
+    Slot& SlotOf(std::string_view id, uint32_t hash) {
+        const std::size_t mask = slots_.size() - 1;
+        for (std::size_t i = hash & mask;; i = (i + 1) & mask) {
+            Slot& slot = slots_[i];
+            if (slot.index == kEmpty || (slot.hash == hash && channels_[slot.index]->Id() == id))
+                return slot;
+        }
+    }
+
+    void Grow() {
+        std::vector<Slot> old(slots_.size() * 2);
+        old.swap(slots_);
+        const std::size_t mask = slots_.size() - 1;
+        for (const Slot& slot : old) {
+            if (slot.index == kEmpty)
+                continue;
+            std::size_t i = slot.hash & mask;
+            while (slots_[i].index != kEmpty)
+                i = (i + 1) & mask;
+            slots_[i] = slot;
+        }
+    }
+
+    const std::vector<std::shared_ptr<Channel>>& channels_;
+    std::vector<Slot> slots_;
+    std::size_t size_ = 0;
 };
 
 }  // namespace
@@ -217,10 +279,9 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         const auto& channels = sequence_.Channels();
         std::size_t index = lastFound_ + lastStride_;
         if (index >= channels.size() || channels[index]->Id() != id) {
-            const std::size_t* found = indexById_.Find(id);
-            if (found == nullptr)
+            index = indexById_.Find(id);
+            if (index == ChannelIdIndex::kNone)
                 return kNoChannel;
-            index = *found;
         }
         lastStride_ = index > lastFound_ ? index - lastFound_ : 1;
         lastFound_ = index;
@@ -350,10 +411,9 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
             Fail(element, "the <channel> has no id");
         Keep(kChannelBytes + name.size() + subsequence.size() + idAttribute->value.size(), element);
         auto channel = std::make_shared<Channel>(std::string(idAttribute->value));
-        if (!indexById_.Insert(std::string_view(channel->Id()), sequence_.Channels().size())
-                 .second) {
+        sequence_.AddChannel(channel);
+        if (!indexById_.Insert(sequence_.Channels().size() - 1))
             Fail(*idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
-        }
         channel->SetName(std::move(name));
         channel->SetChannelType(static_cast<int32_t>(type));
         channel->SetSubsequenceFile(std::move(subsequence));
@@ -362,7 +422,6 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
                                          static_cast<int16_t>(circuit),
                                          static_cast<int16_t>(circuits)));
         channel_ = channel.get();
-        sequence_.AddChannel(std::move(channel));
     }
 
     void ReadEvent(const Elements& elements, const Element& element) {
@@ -501,8 +560,8 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     Sequence& sequence_;
     const detail::XmlPieceReader& reader_;
     std::vector<Context> stack_;
-    // Each channel's index in the sequence, by id (viewing the channel's own copy).
-    FlatMap<std::string_view, std::size_t, ChannelIdHash> indexById_;
+    // Each channel's index in the sequence, by id.
+    ChannelIdIndex indexById_{sequence_.Channels()};
     std::size_t lastFound_ = 0;
     std::size_t lastStride_ = 1;
     Channel* channel_ = nullptr;

@@ -160,6 +160,47 @@ TEST(SequenceLoad, TracksShareOneObjectPerChannelIdWhereverItIsDefined) {
     EXPECT_TRUE(s.Tracks()[2]->Channels().empty());
 }
 
+// Thousands of channels, their ids numbers out of order, numbers with leading zeros (equal
+// in value to others, and hashed alike) and words; a track lists them backwards and every
+// third one, so that the index is asked rather than the guess of the next channel.
+TEST(SequenceLoad, ChannelRefsFindEveryChannelByIdAmongThousands) {
+    TempFolder folder;
+    std::vector<std::string> ids;
+    for (int i = 0; i < 3000; ++i)
+        ids.push_back(std::to_string((i * 7919) % 3001));
+    for (int i = 0; i < 400; ++i)
+        ids.push_back("0" + std::to_string(i));
+    for (int i = 0; i < 400; ++i)
+        ids.push_back("ch" + std::to_string(i));
+    std::string text = "<sequence length=\"10\"><channels>";
+    for (const std::string& id : ids)
+        text += "<channel id=\"" + id + "\" name=\"n" + id + "\"/>";
+    text += "</channels><tracks><track>";
+    for (std::size_t i = ids.size(); i-- > 0;) {
+        if (i % 3 == 0)
+            text += "<channelRef id=\"" + ids[i] + "\"/>";
+    }
+    text += "</track></tracks></sequence>";
+    const Sequence s = LoadText(folder, text);
+    ASSERT_EQ(s.Channels().size(), ids.size());
+    ASSERT_EQ(s.Tracks().size(), 1u);
+    const auto& listed = s.Tracks()[0]->Channels();
+    ASSERT_EQ(listed.size(), (ids.size() + 2) / 3);
+    std::size_t at = 0;
+    for (std::size_t i = ids.size(); i-- > 0;) {
+        if (i % 3 == 0) {
+            EXPECT_EQ(listed[at]->Name(), "n" + ids[i]);
+            EXPECT_EQ(listed[at].get(), s.Channels()[i].get());
+            ++at;
+        }
+    }
+
+    const std::string repeated =
+        text.substr(0, text.find("</channels>")) + "<channel id=\"0399\"/></channels></sequence>";
+    EXPECT_THAT(testing::ErrorOf([&] { LoadText(folder, repeated); }),
+                ::testing::HasSubstr("the channel id \"0399\" is repeated"));
+}
+
 TEST(SequenceLoad, SettingsKeyHoldsTheAddressPartsEachDeviceTypeHas) {
     TempFolder folder;
     const Sequence s = LoadText(folder, WithChannels(10, R"(
