@@ -11,12 +11,11 @@
 
 namespace vtr::seqlib {
 
-// A hash map in one flat array (open addressing, linear probing), for looking up every
-// channel of a sequence by its id, its object or its address: one allocation for the whole
-// map instead of one per entry, and entries side by side in memory. Entries are added,
-// never removed; the array doubles when it is half full. An entry's place is the low bits
-// of its key's hash, so the hash must spread keys there (ids 1, 2, 3... hashed as their
-// value fill the array in order, which keeps a large file's index in the cache).
+// A hash map in one flat array (open addressing, linear probing), for looking up the
+// channels of sequences by their object or their address: one allocation for the whole map
+// instead of one per entry, and entries side by side in memory. Entries are added, never
+// removed; the array doubles when it is half full. An entry's place is the low bits of its
+// key's hash, so the hash must spread keys there.
 template <typename Key, typename Value, typename Hash>
 class FlatMap {
   public:
