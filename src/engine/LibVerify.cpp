@@ -33,57 +33,65 @@
 namespace vtr::LibVerify {
 namespace {
 
-// The queue of checks still to run: first in, first run, with their identifiers kept aside
-// so that "is this check already queued?" costs one lookup however long the queue grows.
+// The identifiers of the run's checks, each with whether a check of it waits in the queue
+// and whether one has run: one entry an identifier, so that "queued or done already?" is
+// one lookup, and a check leaves the queue and joins the done ones without another.
+class CheckIds {
+  public:
+    enum : uint8_t { kQueued = 1, kDone = 2 };
+    // The flags of the identifier, none when it is new (they stay where they are while the
+    // identifier is known).
+    uint8_t& operator[](std::string id) {
+        return flags_.try_emplace(std::move(id), uint8_t{0}).first->second;
+    }
+    void Clear() { flags_.clear(); }
+
+  private:
+    std::unordered_map<std::string, uint8_t> flags_;
+};
+
+// The queue of checks still to run: first in, first run.
 class PendingChecks {
   public:
-    bool Contains(const std::string& id) const { return ids_.count(id) != 0; }
     bool Empty() const { return queue_.empty(); }
     std::size_t Size() const { return queue_.size(); }
-    void Append(std::string id, CheckPtr check) {
-        ids_.insert(id);
-        queue_.emplace_back(std::move(id), std::move(check));
+    void Append(uint8_t& idFlags, CheckPtr check) {
+        idFlags |= CheckIds::kQueued;
+        queue_.emplace_back(&idFlags, std::move(check));
     }
     const CheckPtr& Front() const { return queue_.front().second; }
     void RemoveFront() {
-        ids_.erase(queue_.front().first);
+        *queue_.front().first &= static_cast<uint8_t>(~CheckIds::kQueued);
         queue_.pop_front();
     }
-    void Clear() {
-        queue_.clear();
-        ids_.clear();
-    }
+    void Clear() { queue_.clear(); }
 
   private:
-    std::deque<std::pair<std::string, CheckPtr>> queue_;
-    std::unordered_set<std::string> ids_;
+    std::deque<std::pair<uint8_t*, CheckPtr>> queue_;
 };
 
 // The checks that have run, in the order they finished, each identifier once.
 class DoneChecks {
   public:
-    bool Contains(const std::string& id) const { return ids_.count(id) != 0; }
     std::size_t Size() const { return checks_.size(); }
     // False (and nothing recorded) when a check with that identifier is already done.
-    bool Add(const std::string& id, CheckPtr check) {
-        if (!ids_.insert(id).second)
+    bool Add(uint8_t& idFlags, CheckPtr check) {
+        if ((idFlags & CheckIds::kDone) != 0)
             return false;
+        idFlags |= CheckIds::kDone;
         checks_.push_back(std::move(check));
         return true;
     }
-    void Clear() {
-        checks_.clear();
-        ids_.clear();
-    }
+    void Clear() { checks_.clear(); }
 
   private:
     std::vector<CheckPtr> checks_;
-    std::unordered_set<std::string> ids_;
 };
 
 // The verification state: one instance for the whole program.
 struct VerificationState {
     bool cancelled = false;
+    CheckIds checkIds;
     DoneChecks doneChecks;
     PendingChecks pendingChecks;
     std::vector<ResultPtr> errors;          // not-ignored results of severity Error
@@ -410,6 +418,7 @@ void BeginVerification() {
 
     state.doneChecks.Clear();
     state.pendingChecks.Clear();
+    state.checkIds.Clear();
     state.errors.clear();
     state.ignoredResults.clear();
     state.results.clear();
@@ -469,7 +478,7 @@ void RunVerification() {
         ResumeStep([&] { check->Check(); });
         // A check whose identifier is already done (the version check of an application
         // file shares its existence check's identifier) is not recorded a second time.
-        ResumeStep([&] { state.doneChecks.Add(check->CheckIdentifier(), check); });
+        ResumeStep([&] { state.doneChecks.Add(state.checkIds[check->CheckIdentifier()], check); });
         Broadcast([&](INotificationClient& client) { client.CheckCompleted(*check); });
         ProcessPendingEvents();
     }
@@ -525,10 +534,10 @@ void AddCheck(CheckPtr check) noexcept {
         VerificationState& state = State();
         if (state.cancelled || !check)
             return;
-        std::string id = check->CheckIdentifier();
-        if (state.pendingChecks.Contains(id) || state.doneChecks.Contains(id))
+        uint8_t& idFlags = state.checkIds[check->CheckIdentifier()];
+        if ((idFlags & (CheckIds::kQueued | CheckIds::kDone)) != 0)
             return;
-        state.pendingChecks.Append(std::move(id), check);
+        state.pendingChecks.Append(idFlags, check);
         if (state.prefetch) {
             ResumeStep([&] {
                 for (const std::string& file : SequenceFilesOf(*check, state)) {

@@ -16,9 +16,14 @@ std::size_t PieceBytes(const XmlPieceReader::Options& options) {
     return std::max(options.pieceBytes, kMinPieceBytes);
 }
 
-// Blocks read from the source: a piece's worth, within reason.
-std::size_t ReadBytes(const XmlPieceReader::Options& options) {
-    return std::clamp<std::size_t>(PieceBytes(options), 4096, std::size_t{1} << 20);
+// Blocks read from the source: a piece's worth, within reason, and no more than the file
+// holds (the window holds a few blocks, which a small file need not pay for).
+std::size_t ReadBytes(const XmlPieceReader::Options& options, const ByteSource& source) {
+    constexpr std::size_t kLeast = 4096;
+    const std::size_t bytes =
+        std::clamp<std::size_t>(PieceBytes(options), kLeast, std::size_t{1} << 20);
+    const std::uint64_t file = source.FileBytesTotal();
+    return file > 0 && file < bytes ? std::max<std::size_t>(file + 1, kLeast) : bytes;
 }
 
 // An element that does not end within a thirty-second of a piece is entered rather than
@@ -34,7 +39,7 @@ constexpr int64_t kPlainMarginBytes = int64_t{64} << 10;
 
 XmlPieceReader::XmlPieceReader(ByteSource& source, Options options)
     : options_(std::move(options)),
-      window_(source, ReadBytes(options_), options_.tick),
+      window_(source, ReadBytes(options_, source), options_.tick),
       lines_(window_),
       lexer_(window_, lines_),
       parser_(window_, lines_),
