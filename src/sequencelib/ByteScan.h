@@ -105,13 +105,14 @@ inline const char* FindValueStop(const char* p, const char* end) {
     return p;
 }
 
-// The first byte in [p, end) that cannot go on in a plain name (ASCII letters, digits, '_',
-// '-', '.' and ':'); end when there is none.
+// True for the bytes that may go on in a plain name: ASCII letters, digits, '_', '-', '.'
+// and ':'.
 inline bool IsPlainNameByte(char c) {
     const auto u = static_cast<unsigned char>(c);
     return static_cast<unsigned char>((u | 0x20u) - 'a') <= 25 ||
            static_cast<unsigned char>(u - '0') <= 9 || c == '_' || c == '-' || c == '.' || c == ':';
 }
+// The first byte in [p, end) that cannot go on in a plain name; end when there is none.
 inline const char* FindNameEnd(const char* p, const char* end) {
 #ifdef VTR_SCAN_SSE2
     const __m128i caseBit = _mm_set1_epi8(0x20);

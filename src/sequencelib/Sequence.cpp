@@ -291,10 +291,10 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
     // --- Attributes ---
 
     [[noreturn]] void Fail(const Element& element, std::string cause) const {
-        detail::FailLoad(detail::PlaceText(reader_.PlaceAt(element.at)), std::move(cause));
+        reader_.FailAt(element.at, std::move(cause));
     }
     [[noreturn]] void Fail(const Attribute& attribute, std::string cause) const {
-        detail::FailLoad(detail::PlaceText(reader_.PlaceAt(attribute.at)), std::move(cause));
+        reader_.FailAt(attribute.at, std::move(cause));
     }
 
     // Counts what the sequence keeps for the element: however far a file's text expands, the

@@ -146,9 +146,7 @@ void XmlPieceReader::EnterRoot(XmlPieceHandler& handler, int64_t at, const Lexed
     const std::string_view name = lexer_.NameAt(at + 1);
     const bool empty = tag.kind == Markup::EmptyTag;
     parser_.ParseStartTag(at, tag.end, empty, name, elements_);
-    open_.Push(name, at);
-    handler.EnterElement(elements_);
-    pos_ = tag.end;
+    Enter(handler, at, tag.end);
     if (empty) {
         handler.LeaveElement();
         open_.Pop();
@@ -178,6 +176,24 @@ void XmlPieceReader::ReadEpilog() {
 
 // --- Inside the document element ---------------------------------------------------------
 
+void XmlPieceReader::HandElements(XmlPieceHandler& handler) {
+    if (!elements_.Empty())
+        handler.CompleteElements(elements_);
+}
+
+void XmlPieceReader::Enter(XmlPieceHandler& handler, int64_t at, int64_t tagEnd) {
+    open_.Push(elements_[0].name, at);
+    handler.EnterElement(elements_);
+    pos_ = tagEnd;
+}
+
+void XmlPieceReader::Leave(XmlPieceHandler& handler, int64_t at, int64_t tagEnd) {
+    open_.CheckEndTag(window_.View(at, tagEnd), at);
+    handler.LeaveElement();
+    open_.Pop();
+    pos_ = tagEnd;
+}
+
 void XmlPieceReader::HandNodes(XmlPieceHandler& handler, int64_t from, int64_t to) {
     // Text alone (blanks between elements, mostly) has nothing to parse: only its bytes are
     // checked.
@@ -190,13 +206,11 @@ void XmlPieceReader::HandNodes(XmlPieceHandler& handler, int64_t from, int64_t t
         return;
     }
     if (options_.plainMarkup && plain_.Scan(text, from, elements_)) {
-        if (!elements_.Empty())
-            handler.CompleteElements(elements_);
+        HandElements(handler);
         return;
     }
     const pugi::xml_node misplaced = parser_.ParseNodes(from, to, elements_);
-    if (!elements_.Empty())
-        handler.CompleteElements(elements_);
+    HandElements(handler);
     if (misplaced.type() == pugi::node_declaration)
         parser_.Fail(misplaced, "an XML declaration is allowed only at the start of the document");
     if (misplaced.type() == pugi::node_doctype)
@@ -223,8 +237,7 @@ bool XmlPieceReader::PlainStep(XmlPieceHandler& handler) {
             plainFrom_ = std::max(scanned, pos_ + pieceBytes);
             return false;
         case PlainMarkup::Cut::Kind::Piece:
-            if (!elements_.Empty())
-                handler.CompleteElements(elements_);
+            HandElements(handler);
             // An element too large for the piece ends it, and is read again to be entered.
             readTwice_ += std::max<int64_t>(scanned - cut.at, 0);
             pos_ = cut.at;
@@ -239,18 +252,12 @@ bool XmlPieceReader::PlainStep(XmlPieceHandler& handler) {
                 return false;
             }
             readTwice_ += again;
-            open_.Push(elements_[0].name, cut.at);
-            handler.EnterElement(elements_);
-            pos_ = cut.tagEnd;
+            Enter(handler, cut.at, cut.tagEnd);
             break;
         }
         case PlainMarkup::Cut::Kind::EndTag:
-            if (!elements_.Empty())
-                handler.CompleteElements(elements_);
-            open_.CheckEndTag(window_.View(cut.at, cut.tagEnd), cut.at);
-            handler.LeaveElement();
-            open_.Pop();
-            pos_ = cut.tagEnd;
+            HandElements(handler);
+            Leave(handler, cut.at, cut.tagEnd);
             break;
     }
     // The cut finder's next cut depends only on the text from here on: it starts afresh.
@@ -271,17 +278,12 @@ void XmlPieceReader::Step(XmlPieceHandler& handler) {
         case CutFinder::CutKind::EndTag:
             if (cut.at > pos_)
                 HandNodes(handler, pos_, cut.at);
-            open_.CheckEndTag(window_.View(cut.at, cut.tag.end), cut.at);
-            handler.LeaveElement();
-            open_.Pop();
-            pos_ = cut.tag.end;
+            Leave(handler, cut.at, cut.tag.end);
             break;
         case CutFinder::CutKind::Descend: {
             const std::string_view name = lexer_.NameAt(cut.at + 1);
             parser_.ParseStartTag(cut.at, cut.tag.end, false, name, elements_);
-            open_.Push(name, cut.at);
-            handler.EnterElement(elements_);
-            pos_ = cut.tag.end;
+            Enter(handler, cut.at, cut.tag.end);
             break;
         }
         case CutFinder::CutKind::EndOfData:

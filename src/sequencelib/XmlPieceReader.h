@@ -5,6 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <string>
 
 #include "sequencelib/ByteSource.h"
 #include "sequencelib/CutFinder.h"
@@ -72,6 +73,10 @@ class XmlPieceReader {
     // Where the text offset of an element or attribute handed to the handler stands (valid
     // while the handler runs).
     TextPlace PlaceAt(int64_t offset) const { return lines_.PlaceAt(offset); }
+    // Refuses the document with the place of that text offset.
+    [[noreturn]] void FailAt(int64_t offset, std::string cause) const {
+        lines_.FailAt(offset, std::move(cause));
+    }
 
     // The most text the reader has held at once, in bytes.
     std::size_t BufferBytes() const { return window_.Capacity(); }
@@ -84,6 +89,12 @@ class XmlPieceReader {
     void EnterRoot(XmlPieceHandler& handler, int64_t at, const Lexed& tag);
     void Step(XmlPieceHandler& handler);
     void ReadEpilog();
+    // Hands the elements read over, if there are any.
+    void HandElements(XmlPieceHandler& handler);
+    // Enters the element read alone into elements_, whose start tag is [at, tagEnd).
+    void Enter(XmlPieceHandler& handler, int64_t at, int64_t tagEnd);
+    // Leaves the innermost open element at its end tag [at, tagEnd), checked against it.
+    void Leave(XmlPieceHandler& handler, int64_t at, int64_t tagEnd);
     // One step the plain way, when the content from pos_ on is plain markup; false to take
     // it the general way.
     bool PlainStep(XmlPieceHandler& handler);
