@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <string>
 
 #include "sequencelib/DeviceAddress.h"
@@ -29,8 +30,15 @@ class Channel {
     bool IsSubsequence() const { return channelType_ == kSubsequenceChannelType; }
 
     // The sequence file that a subsequence channel plays ("" for other channels).
-    const std::string& SubsequenceFile() const { return subsequenceFile_; }
-    void SetSubsequenceFile(std::string file) { subsequenceFile_ = std::move(file); }
+    // Few channels play one, so the name is kept apart from the channel.
+    const std::string& SubsequenceFile() const {
+        static const std::string none;
+        return subsequenceFile_ ? *subsequenceFile_ : none;
+    }
+    void SetSubsequenceFile(std::string file) {
+        subsequenceFile_ =
+            file.empty() ? nullptr : std::make_shared<const std::string>(std::move(file));
+    }
 
     // Device settings. The circuit is the start address, Circuits() the number of them.
     const DeviceAddress& Device() const { return device_; }
@@ -69,12 +77,17 @@ class Channel {
     bool IsEverOn() const { return everOn_; }
     void SetEverOn(bool on) { everOn_ = on; }
 
+    // The channel's place in the channel list of the sequence it was last added to.
+    uint32_t IndexInSequence() const { return indexInSequence_; }
+    void SetIndexInSequence(uint32_t index) { indexInSequence_ = index; }
+
   private:
     std::string id_;
     std::string name_;
-    std::string subsequenceFile_;
+    std::shared_ptr<const std::string> subsequenceFile_;
     DeviceAddress device_;
     int32_t channelType_ = 0;
+    uint32_t indexInSequence_ = 0;
     bool everOn_ = false;
 };
 

@@ -4,6 +4,7 @@
 #include <bit>
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <utility>
 #include <vector>
 
@@ -88,5 +89,51 @@ using ChannelMap = FlatMap<const Channel*, Value, ChannelAddressHash>;
 // Channels by the device address they drive (equal exactly when their settings keys are).
 template <typename Value>
 using SettingsMap = FlatMap<Channel::SettingsId, Value, Channel::SettingsIdHash>;
+
+// Values for the channel objects of one sequence, as the checks that walk its tracks keep
+// them: the sequence's own channels by their place in its channel list (an array, no
+// hashing, and neighbours in the tracks are neighbours here), any other channel object
+// through a ChannelMap.
+template <typename Value>
+class SequenceChannelMap {
+  public:
+    explicit SequenceChannelMap(const std::vector<std::shared_ptr<Channel>>& channels)
+        : channels_(channels), entries_(channels.size()) {}
+
+    // As FlatMap::Insert.
+    std::pair<Value*, bool> Insert(const Channel* channel, const Value& value) {
+        if (Entry* entry = Own(channel)) {
+            if (entry->used)
+                return {&entry->value, false};
+            *entry = {value, true};
+            return {&entry->value, true};
+        }
+        return others_.Insert(channel, value);
+    }
+
+    // The value for the channel, or nullptr.
+    const Value* Find(const Channel* channel) const {
+        if (const Entry* entry = const_cast<SequenceChannelMap*>(this)->Own(channel))
+            return entry->used ? &entry->value : nullptr;
+        return others_.Find(channel);
+    }
+
+  private:
+    struct Entry {
+        Value value{};
+        bool used = false;
+    };
+
+    // The entry of one of the sequence's own channels; nullptr for any other channel.
+    Entry* Own(const Channel* channel) {
+        const std::size_t index = channel->IndexInSequence();
+        return index < entries_.size() && channels_[index].get() == channel ? &entries_[index]
+                                                                            : nullptr;
+    }
+
+    const std::vector<std::shared_ptr<Channel>>& channels_;
+    std::vector<Entry> entries_;
+    ChannelMap<Value> others_;
+};
 
 }  // namespace vtr::seqlib

@@ -24,6 +24,19 @@ std::shared_ptr<IntensityFile> Sequence::IntensityFileOf(IntensityFileKind kind)
     return kind == IntensityFileKind::Gridcraft ? gridcraft_ : novalux_;
 }
 
+Channel& Sequence::NewChannel(std::string id) {
+    // Blocks grow with the sequence, from a few channels to a thousand.
+    constexpr std::size_t kFirstBlock = 16;
+    constexpr std::size_t kLargestBlock = 1024;
+    if (!channelBlock_ || channelBlock_->size() == channelBlock_->capacity()) {
+        channelBlock_ = std::make_shared<std::vector<Channel>>();
+        channelBlock_->reserve(std::clamp(channels_.size(), kFirstBlock, kLargestBlock));
+    }
+    Channel& channel = channelBlock_->emplace_back(std::move(id));
+    AddChannel(std::shared_ptr<Channel>(channelBlock_, &channel));
+    return channel;
+}
+
 void Sequence::SetIntensityFile(std::shared_ptr<IntensityFile> file, int32_t trackIndex) {
     if (!file)
         return;
@@ -410,18 +423,17 @@ class SequenceBuilder final : public detail::XmlPieceHandler {
         if (idAttribute == nullptr || idAttribute->value.empty())
             Fail(element, "the <channel> has no id");
         Keep(kChannelBytes + name.size() + subsequence.size() + idAttribute->value.size(), element);
-        auto channel = std::make_shared<Channel>(std::string(idAttribute->value));
-        sequence_.AddChannel(channel);
+        Channel& channel = sequence_.NewChannel(std::string(idAttribute->value));
         if (!indexById_.Insert(sequence_.Channels().size() - 1))
-            Fail(*idAttribute, "the channel id \"" + channel->Id() + "\" is repeated");
-        channel->SetName(std::move(name));
-        channel->SetChannelType(static_cast<int32_t>(type));
-        channel->SetSubsequenceFile(std::move(subsequence));
-        channel->SetDevice(DeviceAddress(static_cast<int32_t>(deviceType),
-                                         static_cast<int32_t>(network), static_cast<uint8_t>(unit),
-                                         static_cast<int16_t>(circuit),
-                                         static_cast<int16_t>(circuits)));
-        channel_ = channel.get();
+            Fail(*idAttribute, "the channel id \"" + channel.Id() + "\" is repeated");
+        channel.SetName(std::move(name));
+        channel.SetChannelType(static_cast<int32_t>(type));
+        channel.SetSubsequenceFile(std::move(subsequence));
+        channel.SetDevice(DeviceAddress(static_cast<int32_t>(deviceType),
+                                        static_cast<int32_t>(network), static_cast<uint8_t>(unit),
+                                        static_cast<int16_t>(circuit),
+                                        static_cast<int16_t>(circuits)));
+        channel_ = &channel;
     }
 
     void ReadEvent(const Elements& elements, const Element& element) {

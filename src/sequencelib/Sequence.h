@@ -86,7 +86,13 @@ class Sequence {
 
     // Every channel of the file, in file order, whether or not a track lists it.
     const std::vector<std::shared_ptr<Channel>>& Channels() const { return channels_; }
-    void AddChannel(std::shared_ptr<Channel> channel) { channels_.push_back(std::move(channel)); }
+    void AddChannel(std::shared_ptr<Channel> channel) {
+        channel->SetIndexInSequence(static_cast<uint32_t>(channels_.size()));
+        channels_.push_back(std::move(channel));
+    }
+    // Adds a new channel of that id, kept with the channels made before it: channels are
+    // made in blocks, one allocation for many, side by side in memory.
+    Channel& NewChannel(std::string id);
 
     const std::vector<std::shared_ptr<Track>>& Tracks() const { return tracks_; }
     void AddTrack(std::shared_ptr<Track> track) { tracks_.push_back(std::move(track)); }
@@ -107,6 +113,8 @@ class Sequence {
     std::string media_;
     std::string shellCommand_;
     std::vector<std::shared_ptr<Channel>> channels_;
+    // The block NewChannel fills (its room reserved, so channels never move).
+    std::shared_ptr<std::vector<Channel>> channelBlock_;
     std::vector<std::shared_ptr<Track>> tracks_;
     std::shared_ptr<IntensityFile> gridcraft_;
     std::shared_ptr<IntensityFile> novalux_;

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include "sequencelib/Sequence.h"
+
 #include <memory>
 #include <string>
 #include <vector>
@@ -54,6 +56,42 @@ TEST(FlatMap, FindsChannelsByObjectAndByAddress) {
     }
     const Channel stranger("x");
     EXPECT_EQ(byObject.Find(&stranger), nullptr);
+}
+
+// The checks keep a value per channel object of a sequence's tracks. Tracks may list a
+// channel object the sequence's list does not hold, or one another sequence holds at the
+// same place: each is a channel of its own.
+TEST(SequenceChannelMap, KeepsOwnAndForeignChannelsApart) {
+    Sequence sequence;
+    Sequence other;
+    for (int i = 0; i < 40; ++i) {
+        sequence.NewChannel("s" + std::to_string(i));
+        other.NewChannel("o" + std::to_string(i));
+    }
+    const auto loose = std::make_shared<Channel>("loose");  // in no sequence's list
+    SequenceChannelMap<int> map(sequence.Channels());
+    for (int i = 0; i < 40; i += 2) {
+        EXPECT_TRUE(map.Insert(sequence.Channels()[i].get(), i).second);
+        EXPECT_TRUE(map.Insert(other.Channels()[i + 1].get(), 100 + i).second);
+    }
+    EXPECT_TRUE(map.Insert(loose.get(), 7).second);
+    EXPECT_FALSE(map.Insert(loose.get(), 8).second);
+    for (int i = 0; i < 40; ++i) {
+        const int* own = map.Find(sequence.Channels()[i].get());
+        const int* foreign = map.Find(other.Channels()[i].get());
+        if (i % 2 == 0) {
+            ASSERT_NE(own, nullptr) << i;
+            EXPECT_EQ(*own, i);
+            EXPECT_EQ(foreign, nullptr) << "another sequence's channel at the same place " << i;
+        } else {
+            EXPECT_EQ(own, nullptr) << i;
+            ASSERT_NE(foreign, nullptr) << i;
+            EXPECT_EQ(*foreign, 100 + i - 1);
+        }
+    }
+    EXPECT_EQ(*map.Find(loose.get()), 7);
+    EXPECT_FALSE(map.Insert(sequence.Channels()[0].get(), -1).second);
+    EXPECT_EQ(*map.Find(sequence.Channels()[0].get()), 0) << "the first value stays";
 }
 
 }  // namespace

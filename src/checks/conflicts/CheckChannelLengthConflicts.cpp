@@ -32,7 +32,7 @@ void CheckChannelLengthConflicts::Check() {
     progress.SetProgressParts(static_cast<int32_t>(std::min<int64_t>(parts, INT32_MAX)));
 
     // The first track that lists each channel object.
-    seqlib::ChannelMap<std::size_t> firstTrack(static_cast<std::size_t>(parts));
+    seqlib::SequenceChannelMap<std::size_t> firstTrack(sequence->Channels());
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
             progress.MakeProgress(1);

@@ -147,7 +147,7 @@ class IntersequenceWalk {
         SectionRecord& section = sections_[SlotOf(sectionFlag)];
 
         const auto& tracks = walked.Tracks();
-        seqlib::ChannelMap<bool> inEarlierTracks(walked.Channels().size());
+        seqlib::SequenceChannelMap<bool> inEarlierTracks(walked.Channels());
         for (std::size_t t = 0; t < tracks.size(); ++t) {
             for (const auto& channel : tracks[t]->Channels()) {
                 ResumeStep([&] {
@@ -169,7 +169,7 @@ class IntersequenceWalk {
   private:
     void WalkChannel(SectionRecord& section, int32_t sequence, int32_t track,
                      const seqlib::Channel& channel,
-                     const seqlib::ChannelMap<bool>& inEarlierTracks) {
+                     const seqlib::SequenceChannelMap<bool>& inEarlierTracks) {
         if (!channel.HasPhysicalSettings())
             return;
         // A channel shared by several tracks of one sequence counts once, with its first.

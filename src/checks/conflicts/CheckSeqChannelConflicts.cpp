@@ -25,10 +25,9 @@ CheckSeqChannelConflicts::CheckSeqChannelConflicts(std::string filename)
 namespace {
 
 // Every channel object reached by walking the tracks in order, each once.
-std::vector<const seqlib::Channel*> DistinctChannels(const seqlib::Sequence& sequence,
-                                                     std::size_t entries) {
+std::vector<const seqlib::Channel*> DistinctChannels(const seqlib::Sequence& sequence) {
     std::vector<const seqlib::Channel*> channels;
-    seqlib::ChannelMap<bool> seen(entries);
+    seqlib::SequenceChannelMap<bool> seen(sequence.Channels());
     for (const auto& track : sequence.Tracks()) {
         for (const auto& channel : track->Channels()) {
             if (seen.Insert(channel.get(), true).second)
@@ -76,7 +75,7 @@ void CheckSeqChannelConflicts::Check() {
     std::size_t entries = 0;
     for (const auto& track : tracks)
         entries += track->Channels().size();
-    const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence, entries);
+    const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence);
 
     // The files present, Gridcraft first, each with the kind and the track that carries it.
     std::vector<Helper::Blobber> blobbers;

@@ -49,7 +49,7 @@ void CheckUsedNetworksDefined::Check() {
     const NetworkPreferences& preferences = LibVerify::GetNetworkPreferences();
 
     const auto& tracks = sequence->Tracks();
-    seqlib::ChannelMap<bool> examined(sequence->Channels().size());
+    seqlib::SequenceChannelMap<bool> examined(sequence->Channels());
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
             if (!examined.Insert(channel.get(), true).second)
