@@ -98,6 +98,8 @@ PlainMarkup::Read PlainMarkup::Element(const char*& where, const char* stop, int
             const uint32_t element = out.Open(name, offsetOf(tag));
             for (;;) {
                 const char* const blank = p;
+                if (p != end && *p == ' ')
+                    ++p;  // the one blank usually between attributes
                 SkipSpace(p, end);
                 if (p == end)
                     return finish(Read::NotPlain);
@@ -121,13 +123,17 @@ PlainMarkup::Read PlainMarkup::Element(const char*& where, const char* stop, int
                 const std::string_view attributeName = Name(p, end);
                 if (attributeName.empty())
                     return finish(Read::NotPlain);
-                SkipSpace(p, end);
-                if (p == end || *p != '=')
-                    return finish(Read::NotPlain);
-                ++p;
-                SkipSpace(p, end);
-                if (p == end || (*p != '"' && *p != '\''))
-                    return finish(Read::NotPlain);
+                if (end - p >= 2 && p[0] == '=' && (p[1] == '"' || p[1] == '\'')) {
+                    ++p;  // as markup is usually written: name="value"
+                } else {
+                    SkipSpace(p, end);
+                    if (p == end || *p != '=')
+                        return finish(Read::NotPlain);
+                    ++p;
+                    SkipSpace(p, end);
+                    if (p == end || (*p != '"' && *p != '\''))
+                        return finish(Read::NotPlain);
+                }
                 const char quote = *p++;
                 const char* const value = p;
                 for (;;) {
