@@ -4,8 +4,10 @@
 #include "App.h"
 #include "Interrupt.h"
 #include "Terminal.h"
+#include "engine/AllocatorSettings.h"
 
 int main(int argc, char** argv) {
+    vtr::SettleAllocator();
     vtr::cli::InstallLastResortCleanUp();
     vtr::cli::Console console{std::cout, std::cerr, vtr::cli::IsTerminal(stderr),
                               vtr::cli::TerminalColumns(stderr)};

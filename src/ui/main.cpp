@@ -27,6 +27,7 @@
 
 #include "UiText.h"
 #include "VtrVersion.h"
+#include "engine/AllocatorSettings.h"
 #include "engine/VtrError.h"
 #include "environment/RegistryStore.h"
 #include "frmVerifier.h"
@@ -149,6 +150,7 @@ bool NoDisplayToOpenOn(int argc, char** argv) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    vtr::SettleAllocator();
     SetApplicationNames();
     AnswerHelpAndVersion(argc, argv);
     if (NoDisplayToOpenOn(argc, argv)) {
