@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string_view>
 #include <vector>
@@ -28,6 +29,10 @@ class XmlElements {
     void Clear() {
         elements_.clear();
         attributes_.clear();
+    }
+    void Reserve(std::size_t elements, std::size_t attributes) {
+        elements_.reserve(elements);
+        attributes_.reserve(attributes);
     }
     bool Empty() const { return elements_.empty(); }
     uint32_t Size() const { return static_cast<uint32_t>(elements_.size()); }

@@ -45,7 +45,12 @@ XmlPieceReader::XmlPieceReader(ByteSource& source, Options options)
       parser_(window_, lines_),
       open_(lines_),
       cuts_(window_, lexer_, lines_, PieceBytes(options_), DescendBytes(options_),
-            options_.maxDepth) {}
+            options_.maxDepth) {
+    // Room for the elements of a block of dense markup (an element in every 48 bytes, an
+    // attribute in every 16) from the start, rather than growing to it copy by copy.
+    const std::size_t bytes = ReadBytes(options_, source);
+    elements_.Reserve(bytes / 48, bytes / 16);
+}
 
 void XmlPieceReader::Run(XmlPieceHandler& handler, const std::function<void()>& afterStep) {
     ReadProlog(handler);
