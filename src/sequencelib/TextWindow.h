@@ -30,6 +30,8 @@ class TextWindow {
     int64_t End() const { return begin_ + static_cast<int64_t>(size_ - front_); }
     // The size of the buffer: the most the window has held at once, give or take a block.
     std::size_t Capacity() const { return capacity_; }
+    // The bytes asked of the source at each read.
+    std::size_t ReadBytes() const { return readBytes_; }
     // True once the source has no more data: End() is the end of the text.
     bool Exhausted() const { return exhausted_; }
 

@@ -48,7 +48,7 @@ XmlPieceReader::XmlPieceReader(ByteSource& source, Options options)
             options_.maxDepth) {
     // Room for the elements of a block of dense markup (an element in every 48 bytes, an
     // attribute in every 16) from the start, rather than growing to it copy by copy.
-    const std::size_t bytes = ReadBytes(options_, source);
+    const std::size_t bytes = window_.ReadBytes();
     elements_.Reserve(bytes / 48, bytes / 16);
 }
 
