@@ -1,13 +1,12 @@
 #pragma once
 
-#include <atomic>
-#include <chrono>
 #include <filesystem>
 #include <fstream>
 #include <stdexcept>
 #include <string>
 
 #include "engine/VtrError.h"
+#include "support/TempStore.h"
 #include "vtrsupport/SequenceGenerator.h"
 
 // Fixture files for the sequence library's tests: a private temporary folder that is
@@ -16,20 +15,6 @@ namespace vtr::seqlib::testing {
 
 class TempFolder {
   public:
-    TempFolder() {
-        static std::atomic<int> counter{0};
-        const auto stamp = std::chrono::steady_clock::now().time_since_epoch().count();
-        path_ = std::filesystem::temp_directory_path() /
-                ("vtr-seqlib-test-" + std::to_string(stamp) + "-" + std::to_string(counter++));
-        std::filesystem::create_directories(path_);
-    }
-    ~TempFolder() {
-        std::error_code ec;
-        std::filesystem::remove_all(path_, ec);
-    }
-    TempFolder(const TempFolder&) = delete;
-    TempFolder& operator=(const TempFolder&) = delete;
-
     const std::filesystem::path& Path() const { return path_; }
     std::string File(const std::string& name) const { return (path_ / name).string(); }
 
@@ -44,7 +29,9 @@ class TempFolder {
     }
 
   private:
-    std::filesystem::path path_;
+    // Made exclusively, so that tests run side by side in other processes never share one.
+    vtr::testsupport::TempFolder folder_;
+    std::filesystem::path path_{folder_.Path()};
 };
 
 using SequenceGenerator::Gzip;
