@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <string_view>
 
 #include "sequencelib/DeviceAddress.h"
 
@@ -17,13 +18,13 @@ inline constexpr int32_t kSubsequenceChannelType = 6;
 // A loaded channel keeps whether it is ever on, not its events.
 class Channel {
   public:
-    explicit Channel(std::string id = {}) : id_(std::move(id)) {}
+    explicit Channel(std::string_view id = {}) : id_(id) {}
 
     // The identifier that tracks use to list the channel (unique in its file).
     const std::string& Id() const { return id_; }
 
     const std::string& Name() const { return name_; }
-    void SetName(std::string name) { name_ = std::move(name); }
+    void SetName(std::string_view name) { name_.assign(name); }
 
     int32_t ChannelType() const { return channelType_; }
     void SetChannelType(int32_t type) { channelType_ = type; }
@@ -35,9 +36,8 @@ class Channel {
         static const std::string none;
         return subsequenceFile_ ? *subsequenceFile_ : none;
     }
-    void SetSubsequenceFile(std::string file) {
-        subsequenceFile_ =
-            file.empty() ? nullptr : std::make_shared<const std::string>(std::move(file));
+    void SetSubsequenceFile(std::string_view file) {
+        subsequenceFile_ = file.empty() ? nullptr : std::make_shared<const std::string>(file);
     }
 
     // Device settings. The circuit is the start address, Circuits() the number of them.

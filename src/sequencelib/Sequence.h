@@ -6,6 +6,7 @@
 #include <functional>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "sequencelib/Channel.h"
@@ -92,7 +93,7 @@ class Sequence {
     }
     // Adds a new channel of that id, kept with the channels made before it: channels are
     // made in blocks, one allocation for many, side by side in memory.
-    Channel& NewChannel(std::string id);
+    Channel& NewChannel(std::string_view id);
 
     const std::vector<std::shared_ptr<Track>>& Tracks() const { return tracks_; }
     void AddTrack(std::shared_ptr<Track> track) { tracks_.push_back(std::move(track)); }
