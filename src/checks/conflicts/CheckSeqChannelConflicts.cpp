@@ -75,8 +75,6 @@ void CheckSeqChannelConflicts::Check() {
     std::size_t entries = 0;
     for (const auto& track : tracks)
         entries += track->Channels().size();
-    const std::vector<const seqlib::Channel*> distinct = DistinctChannels(*sequence);
-
     // The files present, Gridcraft first, each with the kind and the track that carries it.
     std::vector<Helper::Blobber> blobbers;
     for (const auto kind :
@@ -93,13 +91,16 @@ void CheckSeqChannelConflicts::Check() {
     // One part per channel entry of the tracks, per channel compared with a file and per
     // device of a file compared with the files.
     auto parts = static_cast<int64_t>(entries);
+    // The distinct channels are only compared with files: without one, they are not sought.
+    const std::vector<const seqlib::Channel*> distinct =
+        blobbers.empty() ? std::vector<const seqlib::Channel*>() : DistinctChannels(*sequence);
     for (const auto& blobber : blobbers)
         parts += static_cast<int64_t>(distinct.size()) + blobber.file->DeviceCount();
     progress.SetProgressParts(static_cast<int32_t>(std::min<int64_t>(parts, INT32_MAX)));
 
     // Channel against channel: the first channel seen at each address stands for it.
     std::vector<SeqChannelConflictsChInfo> firstSeen;
-    seqlib::SettingsMap<std::size_t> firstSeenAt(distinct.size());
+    seqlib::SettingsMap<std::size_t> firstSeenAt(sequence->Channels().size());
     for (std::size_t t = 0; t < tracks.size(); ++t) {
         for (const auto& channel : tracks[t]->Channels()) {
             progress.MakeProgress(1);
