@@ -14,7 +14,7 @@ namespace vtr {
 //     shows parked there, that walk grows faster than the run.
 //   - the heap grows 64 MB at a time, and the first such room is backed by huge pages
 //     where the system gives them on request: a run over many thousands of channels
-//     faults in a few hundred pages instead of thirteen thousand. Memory that is never
+//     takes some eight hundred page faults instead of thirteen thousand. Memory never
 //     touched is never taken from the system, so a small run stays small.
 // Does nothing where the allocator has no such settings.
 void SettleAllocator();
